@@ -1,0 +1,254 @@
+#ifndef NIB_PIPELINE_STATE_H
+#define NIB_PIPELINE_STATE_H
+
+/// @file
+/// Small GL objects that a drawing pass switches between: blend and depth/stencil states, scissor,
+/// uniform buffers and fences, and what the device can do.
+///
+/// Made by RendererFactory. Every operation that touches GL is called on a GL thread with a current
+/// context. State objects cache nothing: each Activate() issues all its calls.
+
+#include <nib/export.h>
+#include <nib/geometry.h>
+
+#include <cstdint>
+
+// X11 defines this name.
+#pragma push_macro("Always")
+#undef Always
+
+namespace Nib
+{
+
+/// How source and destination are combined once their factors are applied.
+enum class BlendingFunction : int
+{
+    Add = 0,
+    Subtract = 1,        ///< source - destination
+    ReverseSubtract = 2, ///< destination - source
+    Min = 3,             ///< factors are ignored
+    Max = 4              ///< factors are ignored
+};
+
+/// What a source or destination colour is multiplied with.
+enum class BlendingFactor : int
+{
+    Zero = 0,
+    One = 1,
+    SourceColor = 2,
+    OneMinusSourceColor = 3,
+    DestinationColor = 4,
+    OneMinusDestinationColor = 5,
+    SourceAlpha = 6,
+    OneMinusSourceAlpha = 7,
+    DestinationAlpha = 8,
+    OneMinusDestinationAlpha = 9,
+    ConstantColor = 10,
+    OneMinusConstantColor = 11,
+    ConstantAlpha = 12,
+    OneMinusConstantAlpha = 13
+};
+
+/// When a fragment passes the depth or stencil test; the new value is compared with the stored one.
+enum class DepthStencilFunction : int
+{
+    Never = 0,
+    Less = 1,
+    Equal = 2,
+    LessOrEqual = 3,
+    Greater = 4,
+    NotEqual = 5,
+    GreaterOrEqual = 6,
+    Always = 7
+};
+
+/// What happens to a stencil value.
+enum class StencilOperation : int
+{
+    Keep = 0,
+    Zero = 1,
+    Replace = 2,   ///< by the reference value
+    Increment = 3, ///< saturating
+    Decrement = 4, ///< saturating
+    Invert = 5,
+    IncrementWrap = 6,
+    DecrementWrap = 7
+};
+
+/// A blend state as a value. The default modes are those of premultiplied alpha: add, one, one minus
+/// source alpha, for colour and alpha alike.
+struct NIB_EXPORT BlendStateDescriptor
+{
+    explicit BlendStateDescriptor(bool enabled); ///< all colour channels are written
+    BlendStateDescriptor(bool enabled, bool colorWrite);
+
+    void SetEnabled(bool blending, bool writeColor);
+    void SetColorBlendingMode(BlendingFunction function, BlendingFactor src, BlendingFactor dst);
+    void SetAlphaBlendingMode(BlendingFunction function, BlendingFactor src, BlendingFactor dst);
+
+    bool enabled;    ///< blending is on
+    bool colorWrite; ///< all four channels are written, or none
+    BlendingFunction colorFunction;
+    BlendingFunction alphaFunction;
+    BlendingFactor colorSrcFactor;
+    BlendingFactor colorDstFactor;
+    BlendingFactor alphaSrcFactor;
+    BlendingFactor alphaDstFactor;
+};
+
+/// A depth and stencil state as a value. By default depth passes when less and is written, stencil
+/// always passes and is kept, reference 0, all bits read and written.
+struct NIB_EXPORT DepthStencilStateDescriptor
+{
+    DepthStencilStateDescriptor(bool depthEnabled, bool stencilEnabled);
+
+    void SetDepthFunction(DepthStencilFunction function, bool writeDepth);
+    void SetStencilFunction(DepthStencilFunction function, unsigned char ref,
+                            unsigned char readMask, unsigned char writeMask);
+
+    /// Both faces. @p sfail: the stencil test fails; @p dpfail: it passes and depth fails;
+    /// @p dppass: both pass.
+    void SetStencilOperation(StencilOperation sfail, StencilOperation dpfail,
+                             StencilOperation dppass);
+    void SetStencilOperationFront(StencilOperation sfail, StencilOperation dpfail,
+                                  StencilOperation dppass);
+    void SetStencilOperationBack(StencilOperation sfail, StencilOperation dpfail,
+                                 StencilOperation dppass);
+
+    bool depthEnabled;
+    bool stencilEnabled;
+    DepthStencilFunction depthFunction;
+    DepthStencilFunction stencilFunction;
+    StencilOperation frontStencilFail;
+    StencilOperation frontDepthFail;
+    StencilOperation frontPass;
+    StencilOperation backStencilFail;
+    StencilOperation backDepthFail;
+    StencilOperation backPass;
+    std::uint8_t stencilRef;
+    std::uint8_t stencilReadMask;
+    std::uint8_t stencilWriteMask;
+    bool depthWrite;
+};
+
+/// A blend state that can be made current. Holds no GL name and serves every context.
+class NIB_EXPORT IBlendStateObject
+{
+public:
+    virtual ~IBlendStateObject() = default;
+    virtual void SetDescriptor(const BlendStateDescriptor& descriptor) = 0; ///< copied; not yet sent
+    virtual void Activate() = 0; ///< sends the state to the current context
+    virtual void Release() = 0;  ///< deletes the object
+};
+
+/// A depth and stencil state that can be made current. Holds no GL name and serves every context.
+class NIB_EXPORT IDepthStencilState
+{
+public:
+    virtual ~IDepthStencilState() = default;
+
+    /// Copied; not yet sent.
+    virtual void SetDescriptor(const DepthStencilStateDescriptor& descriptor) = 0;
+
+    /// Sends the state to the current context. A test that is off is only switched off: the depth
+    /// write mask, for one, stays as it was.
+    virtual void Activate() = 0;
+    virtual void Release() = 0; ///< deletes the object
+};
+
+/// The scissor of the current context; nothing is kept here.
+class NIB_EXPORT IRasterizerState
+{
+public:
+    /// Pixels, from the lower left corner of the framebuffer.
+    struct ScissorRect
+    {
+        std::int32_t x = 0;
+        std::int32_t y = 0;
+        std::int32_t width = 0;
+        std::int32_t height = 0;
+    };
+
+    virtual ~IRasterizerState() = default;
+    virtual void SetScissorEnabled(bool enabled) = 0;
+    virtual void SetScissorRect(const ScissorRect& rect) = 0;
+    virtual bool IsScissorEnabled() const = 0;
+    virtual ScissorRect GetScissorRect() const = 0;
+};
+
+/// A buffer for a uniform block. It does not survive a context loss: release it before the thread is
+/// paused and make another one afterwards.
+class NIB_EXPORT IUniformBuffer
+{
+public:
+    virtual ~IUniformBuffer() = default; ///< deletes no GL name; that is Release()'s business
+    virtual void Release() = 0;          ///< deletes the GL buffer and the object
+
+    /// Replaces the whole contents by @p size bytes at @p data, which are copied. A null @p data
+    /// leaves the new contents undefined.
+    virtual void Update(const void* data, unsigned int size, BufferUsage usage) = 0;
+
+    /// Binds the buffer to a uniform binding point, 0 to 3; 4 and above ends the process.
+    virtual void Activate(int binding) = 0;
+};
+
+/// A point in the GPU's work that can be waited for. It does not survive a context loss: release it
+/// before the thread is paused and make another one afterwards.
+class NIB_EXPORT IFence
+{
+public:
+    /// What a wait or a query found.
+    enum Result : int
+    {
+        Signaled = 0,    ///< the GPU has passed the fence
+        NotSignaled = 1, ///< not yet: the time is over, or the query came too early
+        Failed = 2       ///< the driver refused
+    };
+
+    virtual ~IFence() = default;
+    virtual void Release() = 0; ///< deletes the sync object and the fence
+    virtual void Insert() = 0;  ///< sets the fence behind all work issued so far, in place of the old
+
+    /// Waits without time-out. Signaled at once when no fence was inserted.
+    virtual Result Wait() = 0;
+
+    /// Waits at most @p timeout nanoseconds, 0 for none. To be called after Insert().
+    virtual Result Wait(unsigned long long timeout) = 0;
+
+    /// Does not wait. To be called after Insert().
+    virtual Result GetStatus() = 0;
+};
+
+/// What the device can do.
+class NIB_EXPORT IRendererDeviceCaps
+{
+public:
+    virtual ~IRendererDeviceCaps() = default;
+
+    /// Greatest width of a texture in pixels; 8192 until a render thread has asked the driver.
+    virtual int GetMaxTextureSize() const = 0;
+};
+
+/// Names the current context and the maker of its GPU.
+class NIB_EXPORT IContextHolder
+{
+public:
+    enum GPUVendor : int
+    {
+        Unknown = 0, ///< no context was current when asked
+        Arm = 1,
+        Qualcomm = 2,
+        Other = 3
+    };
+
+    virtual ~IContextHolder() = default;
+    virtual void* GetCurrentContextId() = 0; ///< the EGLContext current on the calling thread, or null
+    virtual GPUVendor GetGPUVendor() = 0;    ///< asked once per process
+    virtual void WaitForGpuCompletion() = 0; ///< [blocks] until the GPU is done with all issued work
+};
+
+} // namespace Nib
+
+#pragma pop_macro("Always")
+
+#endif
