@@ -37,8 +37,8 @@ public:
     using Position = typename std::list<T*>::iterator;
 
     virtual ~ObserverInterface() = default;
-    virtual Position Subscribe(T* object) = 0;        ///< @p object is borrowed, appended last
-    virtual void Unsubscribe(Position position) = 0;  ///< @p position as Subscribe returned it
+    virtual Position Subscribe(T* object) = 0;       ///< @p object is borrowed, appended last
+    virtual void Unsubscribe(Position position) = 0; ///< @p position as Subscribe returned it
 };
 
 template <typename T>
@@ -46,11 +46,14 @@ class Observer;
 
 /// The subscriber list of one message queue, and the dispatch of context loss to its subscribers.
 ///
-/// Owner    the message queue embeds it. The subscribers are borrowed: destroying the observer frees
+/// Owner    the message queue embeds it. The subscribers are borrowed: destroying the observer
+/// frees
 ///          the entries and reports those that were left, never the objects.
-/// Threads  one re-entrant lock guards everything; it is held for the whole of a dispatch. Called on
+/// Threads  one re-entrant lock guards everything; it is held for the whole of a dispatch. Called
+/// on
 ///          the GL thread of the queue.
-/// Dispatch a subscriber may subscribe or unsubscribe others while it is called, but not itself, and
+/// Dispatch a subscriber may subscribe or unsubscribe others while it is called, but not itself,
+/// and
 ///          must not start another dispatch of the same observer.
 template <>
 class NIB_EXPORT Observer<IManagedObject> : public ObserverInterface<IManagedObject>

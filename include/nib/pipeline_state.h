@@ -75,8 +75,8 @@ enum class StencilOperation : int
     DecrementWrap = 7
 };
 
-/// A blend state as a value. The default modes are those of premultiplied alpha: add, one, one minus
-/// source alpha, for colour and alpha alike.
+/// A blend state as a value. The default modes are those of premultiplied alpha: add, one, one
+/// minus source alpha, for colour and alpha alike.
 struct NIB_EXPORT BlendStateDescriptor
 {
     explicit BlendStateDescriptor(bool enabled); ///< all colour channels are written
@@ -136,7 +136,8 @@ class NIB_EXPORT IBlendStateObject
 {
 public:
     virtual ~IBlendStateObject() = default;
-    virtual void SetDescriptor(const BlendStateDescriptor& descriptor) = 0; ///< copied; not yet sent
+    virtual void
+    SetDescriptor(const BlendStateDescriptor& descriptor) = 0; ///< copied; not yet sent
     virtual void Activate() = 0; ///< sends the state to the current context
     virtual void Release() = 0;  ///< deletes the object
 };
@@ -176,8 +177,8 @@ public:
     virtual ScissorRect GetScissorRect() const = 0;
 };
 
-/// A buffer for a uniform block. It does not survive a context loss: release it before the thread is
-/// paused and make another one afterwards.
+/// A buffer for a uniform block. It does not survive a context loss: release it before the thread
+/// is paused and make another one afterwards.
 class NIB_EXPORT IUniformBuffer
 {
 public:
@@ -207,7 +208,8 @@ public:
 
     virtual ~IFence() = default;
     virtual void Release() = 0; ///< deletes the sync object and the fence
-    virtual void Insert() = 0;  ///< sets the fence behind all work issued so far, in place of the old
+    virtual void
+    Insert() = 0; ///< sets the fence behind all work issued so far, in place of the old
 
     /// Waits without time-out. Signaled at once when no fence was inserted.
     virtual Result Wait() = 0;
@@ -242,9 +244,11 @@ public:
     };
 
     virtual ~IContextHolder() = default;
-    virtual void* GetCurrentContextId() = 0; ///< the EGLContext current on the calling thread, or null
-    virtual GPUVendor GetGPUVendor() = 0;    ///< asked once per process
-    virtual void WaitForGpuCompletion() = 0; ///< [blocks] until the GPU is done with all issued work
+    virtual void*
+    GetCurrentContextId() = 0;            ///< the EGLContext current on the calling thread, or null
+    virtual GPUVendor GetGPUVendor() = 0; ///< asked once per process
+    virtual void
+    WaitForGpuCompletion() = 0; ///< [blocks] until the GPU is done with all issued work
 };
 
 } // namespace Nib

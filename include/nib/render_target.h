@@ -4,9 +4,9 @@
 /// @file
 /// Framebuffers that drawing is directed to, and the depth and stencil storage of offscreen ones.
 ///
-/// Made by RendererFactory, ended by Release(). Everything is called on the GL thread of the context
-/// that made the object, with that context current. Sizes and positions are pixels, the origin is
-/// the lower left corner.
+/// Made by RendererFactory, ended by Release(). Everything is called on the GL thread of the
+/// context that made the object, with that context current. Sizes and positions are pixels, the
+/// origin is the lower left corner.
 
 #include <nib/export.h>
 
@@ -15,8 +15,8 @@
 namespace Nib
 {
 
-/// Depth and stencil storage (24 and 8 bits) for offscreen render targets. It is rebuilt at its size
-/// after a context loss, with undefined contents; the targets that used it are not.
+/// Depth and stencil storage (24 and 8 bits) for offscreen render targets. It is rebuilt at its
+/// size after a context loss, with undefined contents; the targets that used it are not.
 class NIB_EXPORT IDepthStencilBuffer
 {
 public:
@@ -33,9 +33,9 @@ public:
     /// Where ReadPixels puts what it reads.
     struct BufferDescriptor
     {
-        void* pixels = nullptr;      ///< the caller's memory, 4 bytes a pixel: red, green, blue, alpha
-        std::int32_t rowLength = 0;  ///< pixels from row to row in memory; 0: the width that is read
-        std::int32_t skipRows = 0;   ///< rows of memory left untouched before the first
+        void* pixels = nullptr; ///< the caller's memory, 4 bytes a pixel: red, green, blue, alpha
+        std::int32_t rowLength = 0; ///< pixels from row to row in memory; 0: the width that is read
+        std::int32_t skipRows = 0;  ///< rows of memory left untouched before the first
         std::int32_t skipPixels = 0; ///< pixels left untouched before the first of each row
     };
 
@@ -44,13 +44,14 @@ public:
     /// Binds the framebuffer and sets the viewport to its whole size.
     virtual void Activate() = 0;
 
-    /// Ends a pass: tells the driver which contents of the bound framebuffer need not be kept. Colour
-    /// is always kept, and the framebuffer stays bound.
+    /// Ends a pass: tells the driver which contents of the bound framebuffer need not be kept.
+    /// Colour is always kept, and the framebuffer stays bound.
     virtual void Deactivate(bool discardDepth, bool discardStencil) = 0;
 
     /// Waits for the GPU, then reads a rectangle from the target. Binds the target and discards its
     /// depth and stencil contents.
-    virtual void ReadPixels(int x, int y, int width, int height, const BufferDescriptor& buffer) = 0;
+    virtual void ReadPixels(int x, int y, int width, int height,
+                            const BufferDescriptor& buffer) = 0;
 
     /// Deletes the object, and the framebuffer of an offscreen target.
     virtual void Release() = 0;

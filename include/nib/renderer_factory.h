@@ -18,13 +18,15 @@ namespace Nib
 
 /// Creates render threads and GPU resources.
 ///
-/// Owner    the caller. Resources end with their own Release(), on the GL thread of the context that
+/// Owner    the caller. Resources end with their own Release(), on the GL thread of the context
+/// that
 ///          made them; render threads are deleted. What a Get function returns is process-wide and
 ///          never released.
 /// Threads  render threads and the Get functions: any thread. Resources: a GL thread with a current
 ///          context, in practice inside a task on a render thread, because they make GL names and
 ///          subscribe to that thread's queue.
-/// Failure  what a constructor throws reaches the caller, and nothing is leaked. A resource whose GL
+/// Failure  what a constructor throws reaches the caller, and nothing is leaked. A resource whose
+/// GL
 ///          names could not be made is returned without them.
 class NIB_EXPORT RendererFactory
 {
@@ -40,12 +42,11 @@ public:
                                                const TextureBufferInfo* bufferInfo);
 
     /// @p descriptors lay out the @p bufferCount vertex buffers, each of @p vertexCount vertices;
-    /// an @p indexCount of 0 makes no index buffer. Throws InvalidArgumentException for a bad number
-    /// of buffers.
+    /// an @p indexCount of 0 makes no index buffer. Throws InvalidArgumentException for a bad
+    /// number of buffers.
     static IGraphicsObject* CreateGraphicsObject(unsigned int bufferCount, PrimitiveType mode,
                                                  const VertexDescriptor* descriptors,
-                                                 unsigned int vertexCount,
-                                                 unsigned int indexCount);
+                                                 unsigned int vertexCount, unsigned int indexCount);
 
     static IDepthStencilBuffer* CreateDepthStencilBuffer(unsigned int width, unsigned int height);
 
