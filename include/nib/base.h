@@ -174,7 +174,9 @@ public:
 private:
     struct Waiter;
 
-    bool Remove(Waiter* waiter) noexcept;
+    void Append(Waiter* waiter) noexcept;
+    bool GiveUp(Waiter* waiter) noexcept;
+    void Unlink(Waiter* waiter) noexcept;
 
     pthread_mutex_t m_guard = PTHREAD_MUTEX_INITIALIZER;
     Waiter* m_first = nullptr;
