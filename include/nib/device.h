@@ -261,7 +261,7 @@ private:
     };
 
     static void ReadTextureLimits();
-    static void LogUniformLimits();
+    static void LogUniformLimits(const char* function);
 
     static GlParameters m_glParameters;
     static std::atomic<bool> m_isSupportSampler;
