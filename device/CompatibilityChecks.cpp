@@ -66,7 +66,7 @@ void RunOnce(void (*check)(bool*), CachedCheck& cache) NIB_REQUIRES(g_checkLock)
     cache.checked = true;
 }
 
-bool IsGLVersionSufficient()
+bool IsGLSufficient()
 {
     const char* version = OpenGLRenderer::getGLVersion();
     if (version == nullptr)
@@ -88,9 +88,9 @@ bool IsGLVersionSufficient()
 }
 
 // Render thread.
-void CheckGLVersion(bool* compatible)
+void CheckGL(bool* compatible)
 {
-    *compatible = IsGLVersionSufficient();
+    *compatible = IsGLSufficient();
 }
 
 // Render thread.
@@ -124,7 +124,7 @@ bool IsCompatibleGL()
 {
     NIB_FUNCTION("bool Nib::IsCompatibleGL()");
     AutoCriticalSection lock(g_checkLock);
-    RunOnce(&CheckGLVersion, g_glCompatible);
+    RunOnce(&CheckGL, g_glCompatible);
     LogAnswer(function, g_glCompatible.result);
     return g_glCompatible.result;
 }
