@@ -93,10 +93,10 @@ public:
     /// in the queue. Not supported by the surface render thread.
     virtual void OnPause() = 0;
 
-    /// Undoes OnPause with a new context. [blocks] until the parent has handed over its context,
-    /// not until the objects are restored: before the parent is paused or deleted, call
-    /// waitForCompleting() of this thread's queue. Tasks that were posted during the pause run
-    /// first, still without a context.
+    /// Undoes OnPause, and comes only after it, with a new context. [blocks] until the parent has
+    /// handed over its context, not until the objects are restored: before the parent is paused or
+    /// deleted, call waitForCompleting() of this thread's queue. Tasks that were posted during the
+    /// pause run first, still without a context.
     virtual void OnResume() = 0;
 };
 
