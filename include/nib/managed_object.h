@@ -47,14 +47,11 @@ class Observer;
 /// The subscriber list of one message queue, and the dispatch of context loss to its subscribers.
 ///
 /// Owner    the message queue embeds it. The subscribers are borrowed: destroying the observer
-/// frees
-///          the entries and reports those that were left, never the objects.
-/// Threads  one re-entrant lock guards everything; it is held for the whole of a dispatch. Called
-/// on
-///          the GL thread of the queue.
-/// Dispatch a subscriber may subscribe or unsubscribe others while it is called, but not itself,
-/// and
-///          must not start another dispatch of the same observer.
+///          frees the entries and reports those that were left, never the objects.
+/// Threads  the GL thread of the queue. One re-entrant lock guards everything; it is held for the
+///          whole of a dispatch.
+/// Dispatch a subscriber that is being called may subscribe and unsubscribe others, but not itself,
+///          and must not start another dispatch of the same observer.
 template <>
 class NIB_EXPORT Observer<IManagedObject> : public ObserverInterface<IManagedObject>
 {

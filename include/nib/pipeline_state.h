@@ -136,8 +136,9 @@ class NIB_EXPORT IBlendStateObject
 {
 public:
     virtual ~IBlendStateObject() = default;
-    virtual void
-    SetDescriptor(const BlendStateDescriptor& descriptor) = 0; ///< copied; not yet sent
+
+    /// Copied; not yet sent.
+    virtual void SetDescriptor(const BlendStateDescriptor& descriptor) = 0;
     virtual void Activate() = 0; ///< sends the state to the current context
     virtual void Release() = 0;  ///< deletes the object
 };
@@ -208,8 +209,9 @@ public:
 
     virtual ~IFence() = default;
     virtual void Release() = 0; ///< deletes the sync object and the fence
-    virtual void
-    Insert() = 0; ///< sets the fence behind all work issued so far, in place of the old
+
+    /// Sets the fence behind all work issued so far, in place of the old one.
+    virtual void Insert() = 0;
 
     /// Waits without time-out. Signaled at once when no fence was inserted.
     virtual Result Wait() = 0;
@@ -244,11 +246,15 @@ public:
     };
 
     virtual ~IContextHolder() = default;
-    virtual void*
-    GetCurrentContextId() = 0;            ///< the EGLContext current on the calling thread, or null
-    virtual GPUVendor GetGPUVendor() = 0; ///< asked once per process
-    virtual void
-    WaitForGpuCompletion() = 0; ///< [blocks] until the GPU is done with all issued work
+
+    /// The EGLContext current on the calling thread, or null.
+    virtual void* GetCurrentContextId() = 0;
+
+    /// Asked of the driver once per process; Unknown as long as no context was current.
+    virtual GPUVendor GetGPUVendor() = 0;
+
+    /// [blocks] until the GPU is done with all work issued on the current context.
+    virtual void WaitForGpuCompletion() = 0;
 };
 
 } // namespace Nib

@@ -19,15 +19,13 @@ namespace Nib
 /// Creates render threads and GPU resources.
 ///
 /// Owner    the caller. Resources end with their own Release(), on the GL thread of the context
-/// that
-///          made them; render threads are deleted. What a Get function returns is process-wide and
-///          never released.
+///          that made them; render threads are deleted. What a Get function returns is
+///          process-wide and never released.
 /// Threads  render threads and the Get functions: any thread. Resources: a GL thread with a current
 ///          context, in practice inside a task on a render thread, because they make GL names and
 ///          subscribe to that thread's queue.
 /// Failure  what a constructor throws reaches the caller, and nothing is leaked. A resource whose
-/// GL
-///          names could not be made is returned without them.
+///          GL names could not be made is returned without them.
 class NIB_EXPORT RendererFactory
 {
 public:
