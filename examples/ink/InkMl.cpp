@@ -1,0 +1,230 @@
+#include "InkMl.h"
+
+#include "InkMlTrace.h"
+
+#include <pugixml.hpp>
+
+#include <algorithm>
+#include <cmath>
+#include <map>
+#include <optional>
+#include <string_view>
+
+namespace Ink
+{
+namespace
+{
+
+/// The name without its namespace prefix.
+std::string_view LocalName(const pugi::xml_node& node)
+{
+    const std::string_view name = node.name();
+    const std::size_t colon = name.rfind(':');
+    return colon == std::string_view::npos ? name : name.substr(colon + 1);
+}
+
+/// What a reference such as contextRef="#c1" points to.
+std::string_view Target(const pugi::xml_attribute& reference)
+{
+    const std::string_view value = reference.value();
+    return !value.empty() && value.front() == '#' ? value.substr(1) : value;
+}
+
+std::string_view Id(const pugi::xml_node& node)
+{
+    const pugi::xml_attribute id = node.attribute("xml:id");
+    return id ? id.value() : node.attribute("id").value();
+}
+
+class Reader
+{
+public:
+    Reader(const std::string& path, const std::string& text) : m_path(path), m_text(text) {}
+
+    Recording Read()
+    {
+        pugi::xml_document document;
+        const pugi::xml_parse_result result =
+            document.load_buffer(m_text.data(), m_text.size(), pugi::parse_default);
+        if (!result)
+            Fail(result.offset, std::string("not well-formed XML: ") + result.description());
+        const pugi::xml_node root = document.document_element();
+        if (LocalName(root) != "ink")
+            Fail(root.offset_debug(), "not InkML: the outermost element is not <ink>");
+        CollectFormats(root);
+        CollectTraces(root);
+        if (m_recording.strokes.empty())
+            Fail(root.offset_debug(), "there is no trace in it");
+        Normalise();
+        return std::move(m_recording);
+    }
+
+private:
+    [[noreturn]] void Fail(std::ptrdiff_t offset, const std::string& problem) const
+    {
+        const auto end = m_text.begin() + std::clamp<std::ptrdiff_t>(
+                                              offset, 0, static_cast<std::ptrdiff_t>(m_text.size()));
+        const auto line = 1 + std::count(m_text.begin(), end, '\n');
+        throw ReadError(m_path, static_cast<std::size_t>(line), problem);
+    }
+
+    /// Every node below @p root in document order, without recursion: depth is the file's choice.
+    template <typename Visit> static void Walk(const pugi::xml_node& root, Visit visit)
+    {
+        pugi::xml_node node = root;
+        while (node)
+        {
+            visit(node);
+            if (node.first_child())
+            {
+                node = node.first_child();
+                continue;
+            }
+            while (node && node != root && !node.next_sibling())
+                node = node.parent();
+            node = node == root ? pugi::xml_node() : node.next_sibling();
+        }
+    }
+
+    void CollectFormats(const pugi::xml_node& root)
+    {
+        Walk(root,
+             [this](const pugi::xml_node& node)
+             {
+                 if (LocalName(node) == "traceFormat")
+                     AddFormat(node);
+                 else if (LocalName(node) == "context" && !Id(node).empty())
+                     m_contexts.emplace(Id(node), node);
+             });
+    }
+
+    void AddFormat(const pugi::xml_node& node)
+    {
+        TraceFormat format;
+        for (const pugi::xml_node& channel : node.children())
+            if (LocalName(channel) == "channel")
+                format.channels.push_back(ReadChannel(channel));
+            else if (LocalName(channel) == "intermittentChannels")
+                for (const pugi::xml_node& optional : channel.children())
+                    if (LocalName(optional) == "channel")
+                        format.intermittent.push_back(ReadChannel(optional));
+        if (!format.Has("X") || !format.Has("Y"))
+            Fail(node.offset_debug(), "the trace format has no X or no Y channel");
+        m_formatsByNode.emplace(node.hash_value(), format);
+        if (!Id(node).empty())
+            m_formatsById.emplace(Id(node), format);
+        if (!m_firstFormat)
+            m_firstFormat = format;
+    }
+
+    static Channel ReadChannel(const pugi::xml_node& node)
+    {
+        Channel channel;
+        channel.name = node.attribute("name").value();
+        channel.isBoolean = std::string_view(node.attribute("type").value()) == "boolean";
+        channel.max = node.attribute("max").as_double(0.0);
+        channel.min = node.attribute("min").as_double(0.0);
+        channel.isReversed = std::string_view(node.attribute("orientation").value()) == "-ve";
+        channel.units = node.attribute("units").value();
+        return channel;
+    }
+
+    /// The format of @p trace: its context's, else that of an enclosing group, else the file's
+    /// first, else plain X and Y.
+    TraceFormat FormatOf(const pugi::xml_node& trace) const
+    {
+        for (pugi::xml_node node = trace; node; node = node.parent())
+            if (const pugi::xml_attribute reference = node.attribute("contextRef"))
+                if (const TraceFormat* format = FormatOfContext(Target(reference)))
+                    return *format;
+        return m_firstFormat ? *m_firstFormat : TraceFormat::Plain();
+    }
+
+    const TraceFormat* FormatOfContext(std::string_view id) const
+    {
+        const auto context = m_contexts.find(id);
+        if (context == m_contexts.end())
+            return nullptr;
+        if (const pugi::xml_attribute reference = context->second.attribute("traceFormatRef"))
+        {
+            const auto format = m_formatsById.find(Target(reference));
+            return format == m_formatsById.end() ? nullptr : &format->second;
+        }
+        const TraceFormat* found = nullptr;
+        Walk(context->second,
+             [&](const pugi::xml_node& node)
+             {
+                 const auto format = m_formatsByNode.find(node.hash_value());
+                 if (!found && format != m_formatsByNode.end())
+                     found = &format->second;
+             });
+        return found;
+    }
+
+    void CollectTraces(const pugi::xml_node& root)
+    {
+        Walk(root,
+             [this](const pugi::xml_node& node)
+             {
+                 if (LocalName(node) == "trace" &&
+                     std::string_view(node.attribute("type").value()) != "penUp")
+                     AddTrace(node);
+             });
+    }
+
+    void AddTrace(const pugi::xml_node& node)
+    {
+        const TraceFormat format = FormatOf(node);
+        TraceDecoder decoder(format);
+        Stroke stroke;
+        std::string problem;
+        if (!decoder.Decode(node.text().get(), stroke, problem))
+            Fail(node.text().data().offset_debug(), problem);
+        if (stroke.empty())
+            Fail(node.offset_debug(), "the trace has no point");
+        m_hasTime = m_hasTime || format.Has("T");
+        m_recording.strokes.push_back(std::move(stroke));
+    }
+
+    /// Brings pressures without a stated range to 0..1 and gives a recording without times a steady
+    /// rate, so that it can be replayed.
+    void Normalise()
+    {
+        float greatest = 1.0f;
+        for (const Stroke& stroke : m_recording.strokes)
+            for (const Sample& sample : stroke)
+                greatest = std::max(greatest, sample.pressure);
+        double time = 0.0;
+        for (Stroke& stroke : m_recording.strokes)
+        {
+            // Some files count the time of each trace from zero.
+            const double shift = std::max(0.0, time - stroke.front().time);
+            for (Sample& sample : stroke)
+            {
+                sample.pressure = std::clamp(sample.pressure / greatest, 0.0f, 1.0f);
+                time = m_hasTime ? std::max(time, sample.time + shift) : time + kSteadyRate;
+                sample.time = time;
+            }
+        }
+    }
+
+    static constexpr double kSteadyRate = 0.008;
+
+    const std::string& m_path;
+    const std::string& m_text;
+    Recording m_recording;
+    std::map<std::string, TraceFormat, std::less<>> m_formatsById;
+    std::map<std::size_t, TraceFormat> m_formatsByNode;
+    std::map<std::string, pugi::xml_node, std::less<>> m_contexts;
+    std::optional<TraceFormat> m_firstFormat;
+    bool m_hasTime = false;
+};
+
+} // namespace
+
+Recording ReadInkMl(const std::string& path, const std::string& text)
+{
+    return Reader(path, text).Read();
+}
+
+} // namespace Ink
