@@ -1,0 +1,119 @@
+#include "InkSession.h"
+
+#include <algorithm>
+#include <exception>
+#include <utility>
+
+namespace Ink
+{
+
+struct InkSession::GlState
+{
+    std::unique_ptr<InkPainter> painter;
+    std::unique_ptr<Page> page;
+    std::unique_ptr<PageView> view;
+    std::string error;
+};
+
+/// Posts @p work with the GL state; an exception in it is kept for Error(), since the render
+/// thread does not catch.
+template <typename Work> void InkSession::PostGuarded(Work work)
+{
+    Post(*m_thread.GetMsgQueue(),
+         [gl = m_gl, work = std::move(work)]
+         {
+             try
+             {
+                 if (gl->error.empty())
+                     work(*gl);
+             }
+             catch (const std::exception& failure)
+             {
+                 gl->error = failure.what();
+             }
+         });
+}
+
+InkSession::InkSession(Nib::RenderThreadGL& thread, int width, int height, const Colour& paper)
+    : m_thread(thread), m_width(width), m_height(height), m_gl(std::make_shared<GlState>()),
+      m_dirty(0.0f, 0.0f, static_cast<float>(width), static_cast<float>(height))
+{
+    PostGuarded(
+        [width, height, paper](GlState& gl)
+        {
+            gl.painter = std::make_unique<InkPainter>();
+            gl.page = std::make_unique<Page>(width, height, paper);
+        });
+}
+
+InkSession::~InkSession()
+{
+    Post(*m_thread.GetMsgQueue(),
+         [gl = m_gl]
+         {
+             gl->view.reset();
+             gl->page.reset();
+             gl->painter.reset();
+         });
+    m_thread.GetMsgQueue()->waitForCompleting();
+}
+
+void InkSession::AttachWindow(void* window)
+{
+    m_thread.OnSurfaceChanged(window, m_width, m_height, 0);
+    PostGuarded([width = m_width, height = m_height](GlState& gl)
+                { gl.view = std::make_unique<PageView>(width, height); });
+    m_dirty.Set(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
+}
+
+void InkSession::Draw(std::vector<Vertex> triangles, const Colour& colour)
+{
+    if (triangles.empty())
+        return;
+    m_dirty.Union(Bounds(triangles));
+    PostGuarded([triangles = std::move(triangles), colour](GlState& gl)
+                { gl.page->Draw(*gl.painter, triangles, colour); });
+}
+
+void InkSession::Present()
+{
+    Nib::RectF visible(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
+    if (m_dirty.IsEmpty() || !visible.Intersect(m_dirty))
+        visible.Set(0.0f, 0.0f, 0.0f, 0.0f);
+    m_dirty.Set(0.0f, 0.0f, 0.0f, 0.0f);
+
+    m_thread.ApplyUpdateRect(visible, 0);
+    PostGuarded(
+        [visible](GlState& gl)
+        {
+            if (gl.view)
+                gl.view->Draw(gl.page->Texture(), visible);
+        });
+    m_thread.Render();
+}
+
+std::vector<std::uint8_t> InkSession::ReadPixels()
+{
+    auto pixels = std::make_shared<std::vector<std::uint8_t>>();
+    PostGuarded([pixels](GlState& gl) { *pixels = gl.page->ReadPixels(); });
+    m_thread.GetMsgQueue()->waitForCompleting();
+    return std::move(*pixels);
+}
+
+std::string InkSession::Error()
+{
+    m_thread.GetMsgQueue()->waitForCompleting();
+    return m_gl->error;
+}
+
+Nib::RectF Bounds(const std::vector<Vertex>& triangles)
+{
+    if (triangles.empty())
+        return Nib::RectF();
+    Nib::RectF box(triangles[0].x, triangles[0].y, triangles[0].x, triangles[0].y);
+    for (const Vertex& vertex : triangles)
+        box.MakeRect(vertex.x, vertex.y);
+    return box;
+}
+
+} // namespace Ink
