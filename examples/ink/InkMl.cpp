@@ -62,14 +62,16 @@ public:
 private:
     [[noreturn]] void Fail(std::ptrdiff_t offset, const std::string& problem) const
     {
-        const auto end = m_text.begin() + std::clamp<std::ptrdiff_t>(
-                                              offset, 0, static_cast<std::ptrdiff_t>(m_text.size()));
+        const auto end =
+            m_text.begin() +
+            std::clamp<std::ptrdiff_t>(offset, 0, static_cast<std::ptrdiff_t>(m_text.size()));
         const auto line = 1 + std::count(m_text.begin(), end, '\n');
         throw ReadError(m_path, static_cast<std::size_t>(line), problem);
     }
 
     /// Every node below @p root in document order, without recursion: depth is the file's choice.
-    template <typename Visit> static void Walk(const pugi::xml_node& root, Visit visit)
+    template <typename Visit>
+    static void Walk(const pugi::xml_node& root, Visit visit)
     {
         pugi::xml_node node = root;
         while (node)

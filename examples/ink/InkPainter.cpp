@@ -39,7 +39,7 @@ void main()
 
 constexpr int kBrushUnit = 0;
 constexpr int kBrushWidth = 256;
-constexpr float kBrushReach = 2.0f;         // pixels to either side of the outline
+constexpr float kBrushReach = 2.0f;          // pixels to either side of the outline
 constexpr unsigned int kLargestDraw = 49152; // vertices; a multiple of three
 
 std::array<std::uint8_t, kBrushWidth * 4> BrushPixels()
@@ -77,14 +77,12 @@ InkPainter::InkPainter()
     m_brushUnit.reset(m_program->GetBindingIntf("u_brush"));
 
     const Nib::VertexDescriptor vertex = InkVertex();
-    m_mesh.reset(
-        Factory::CreateGraphicsObject(1, Nib::PrimitiveType::Triangles, &vertex, 0, 0));
+    m_mesh.reset(Factory::CreateGraphicsObject(1, Nib::PrimitiveType::Triangles, &vertex, 0, 0));
 
     Nib::TextureDescriptor brush; // RGBA, linear filters, clamped to the edge
     brush.width = kBrushWidth;
     brush.height = 1;
-    m_brush.reset(
-        Factory::CreateTextureObject(brush, BrushPixels().data(), nullptr, 0, nullptr));
+    m_brush.reset(Factory::CreateTextureObject(brush, BrushPixels().data(), nullptr, 0, nullptr));
     m_brush->SetTag("ink brush");
 
     m_blending.reset(Factory::CreateBlendStateObject(Nib::BlendStateDescriptor(true)));
@@ -113,6 +111,9 @@ void InkPainter::Draw(const std::vector<Vertex>& triangles, const Colour& colour
     }
 }
 
-void InkPainter::RestoreContents() { m_brush->Update(BrushPixels().data(), 0); }
+void InkPainter::RestoreContents()
+{
+    m_brush->Update(BrushPixels().data(), 0);
+}
 
 } // namespace Ink

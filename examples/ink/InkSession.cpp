@@ -17,7 +17,8 @@ struct InkSession::GlState
 
 /// Posts @p work with the GL state; an exception in it is kept for Error(), since the render
 /// thread does not catch.
-template <typename Work> void InkSession::PostGuarded(Work work)
+template <typename Work>
+void InkSession::PostGuarded(Work work)
 {
     Post(*m_thread.GetMsgQueue(),
          [gl = m_gl, work = std::move(work)]

@@ -45,7 +45,8 @@ public:
 
 private:
     struct GlState;
-    template <typename Work> void PostGuarded(Work work);
+    template <typename Work>
+    void PostGuarded(Work work);
 
     Nib::RenderThreadGL& m_thread;
     int m_width;

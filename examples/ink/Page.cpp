@@ -9,8 +9,10 @@ Page::Page(int width, int height, const Colour& paper) : m_paper(paper)
     descriptor.width = width;
     descriptor.height = height;
     const unsigned int nearest[] = {
-        Nib::kTextureParamMagFilter, Nib::kTextureFilterNearest, // shown pixel by pixel
-        Nib::kTextureParamMinFilter, Nib::kTextureFilterNearest,
+        Nib::kTextureParamMagFilter,
+        Nib::kTextureFilterNearest, // shown pixel by pixel
+        Nib::kTextureParamMinFilter,
+        Nib::kTextureFilterNearest,
     };
     m_texture.reset(
         Nib::RendererFactory::CreateTextureObject(descriptor, nullptr, nearest, 2, nullptr));

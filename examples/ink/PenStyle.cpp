@@ -8,9 +8,9 @@ namespace Ink
 namespace
 {
 
-constexpr float kMargin = 0.05f;       // of the page, on each side
-constexpr float kLightest = 0.2f;      // of the full width, when the pen barely touches
-constexpr float kThinnest = 0.35f;     // pixels; below it a stroke breaks into dots
+constexpr float kMargin = 0.05f;   // of the page, on each side
+constexpr float kLightest = 0.2f;  // of the full width, when the pen barely touches
+constexpr float kThinnest = 0.35f; // pixels; below it a stroke breaks into dots
 
 } // namespace
 

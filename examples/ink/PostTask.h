@@ -11,7 +11,8 @@ namespace Ink
 {
 
 /// Runs a callable on a render thread. It must not throw: a task has nobody to catch it.
-template <typename Callable> class CallableTask : public Nib::ITask
+template <typename Callable>
+class CallableTask : public Nib::ITask
 {
 public:
     explicit CallableTask(Callable callable) : m_callable(std::move(callable)) {}
@@ -23,7 +24,8 @@ private:
 
 /// Posts @p callable to @p queue; it runs later, on the queue's thread, after everything posted
 /// before. Never blocks.
-template <typename Callable> void Post(Nib::IGLMsgQueue& queue, Callable callable)
+template <typename Callable>
+void Post(Nib::IGLMsgQueue& queue, Callable callable)
 {
     auto task = std::make_unique<CallableTask<Callable>>(std::move(callable));
     if (queue.enQueueMsg(task.get()))
@@ -33,11 +35,16 @@ template <typename Callable> void Post(Nib::IGLMsgQueue& queue, Callable callabl
 /// The way the factory's objects are ended.
 struct Releaser
 {
-    template <typename T> void operator()(T* object) const { object->Release(); }
+    template <typename T>
+    void operator()(T* object) const
+    {
+        object->Release();
+    }
 };
 
 /// Owns an object of the factory; to be reset on the thread that made it.
-template <typename T> using Owned = std::unique_ptr<T, Releaser>;
+template <typename T>
+using Owned = std::unique_ptr<T, Releaser>;
 
 } // namespace Ink
 

@@ -8,15 +8,18 @@ namespace Ink
 namespace
 {
 
-constexpr float kFade = 1.0f;          // pixels that the triangles reach beyond the outline
-constexpr float kStep = 2.0f;          // pixels along the curve between two sections
-constexpr int kMostSteps = 48;         // between two points, however far apart
-constexpr float kFarthest = 1.0e6f;    // beyond any page; keeps the arithmetic finite
-constexpr float kSharpTurn = 0.94f;    // cosine of the angle from which a join is round
-constexpr float kFlatness = 0.1f;      // pixels between a disc and the polygon that stands for it
+constexpr float kFade = 1.0f;       // pixels that the triangles reach beyond the outline
+constexpr float kStep = 2.0f;       // pixels along the curve between two sections
+constexpr int kMostSteps = 48;      // between two points, however far apart
+constexpr float kFarthest = 1.0e6f; // beyond any page; keeps the arithmetic finite
+constexpr float kSharpTurn = 0.94f; // cosine of the angle from which a join is round
+constexpr float kFlatness = 0.1f;   // pixels between a disc and the polygon that stands for it
 constexpr float kPi = 3.14159265f;
 
-float Distance(const PenPoint& a, const PenPoint& b) { return std::hypot(b.x - a.x, b.y - a.y); }
+float Distance(const PenPoint& a, const PenPoint& b)
+{
+    return std::hypot(b.x - a.x, b.y - a.y);
+}
 
 void AddTriangle(std::vector<Vertex>& triangles, const Vertex& a, const Vertex& b, const Vertex& c)
 {
@@ -136,8 +139,7 @@ void StrokeMesh::AddCurve(const PenPoint& before, const PenPoint& from, const Pe
         const PenPoint centre{h00 * from.x + h10 * tangents.fromX + h01 * to.x + h11 * tangents.toX,
                               h00 * from.y + h10 * tangents.fromY + h01 * to.y + h11 * tangents.toY,
                               from.radius + t * (to.radius - from.radius)};
-        AddSection(centre,
-                   d00 * from.x + d10 * tangents.fromX + d01 * to.x + d11 * tangents.toX,
+        AddSection(centre, d00 * from.x + d10 * tangents.fromX + d01 * to.x + d11 * tangents.toX,
                    d00 * from.y + d10 * tangents.fromY + d01 * to.y + d11 * tangents.toY,
                    triangles);
     }

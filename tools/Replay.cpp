@@ -1,0 +1,64 @@
+#include "Replay.h"
+
+#include <chrono>
+#include <thread>
+#include <utility>
+
+namespace
+{
+
+using Clock = std::chrono::steady_clock;
+
+/// Holds the replay back to the recorded times.
+class Pacer
+{
+public:
+    Pacer(double speed, double firstTime) : m_speed(speed), m_firstTime(firstTime) {}
+
+    void WaitFor(double time) const
+    {
+        if (m_speed <= 0.0)
+            return;
+        const std::chrono::duration<double> offset((time - m_firstTime) / m_speed);
+        std::this_thread::sleep_until(m_start +
+                                      std::chrono::duration_cast<Clock::duration>(offset));
+    }
+
+private:
+    double m_speed;
+    double m_firstTime;
+    Clock::time_point m_start = Clock::now();
+};
+
+} // namespace
+
+bool Replay(Ink::InkSession& session, const Ink::Recording& recording,
+            const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace)
+{
+    const double firstTime = recording.strokes.front().front().time;
+    const Pacer pacer(pace.speed, firstTime);
+    Ink::StrokeMesh mesh;
+    std::vector<Ink::Vertex> piece;
+    const auto draw = [&]
+    {
+        session.Draw(std::exchange(piece, {}), style.colour);
+        if (pace.framePerSample)
+            session.Present();
+    };
+    for (const Ink::Stroke& stroke : recording.strokes)
+    {
+        mesh.Begin();
+        for (const Ink::Sample& sample : stroke)
+        {
+            if (pace.isWanted && !pace.isWanted())
+                return false;
+            pacer.WaitFor(sample.time);
+            mesh.Add(Ink::ToPage(sample, placement, style), piece);
+            if (&sample == &stroke.back())
+                mesh.End(piece);
+            if (pace.framePerSample || &sample == &stroke.back())
+                draw();
+        }
+    }
+    return true;
+}

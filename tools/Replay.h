@@ -1,0 +1,22 @@
+#ifndef NIB_TOOLS_REPLAY_H
+#define NIB_TOOLS_REPLAY_H
+
+#include "InkSession.h"
+#include "PenStyle.h"
+#include "Recording.h"
+
+#include <functional>
+
+/// When a replay shows a frame, and how fast it runs.
+struct Pace
+{
+    double speed = 0.0;             ///< times the recorded speed; 0: as fast as it goes
+    bool framePerSample = false;    ///< present after every sample, else not at all
+    std::function<bool()> isWanted; ///< asked before each sample; false ends the replay
+};
+
+/// Draws @p recording into @p session, sample by sample. False when it was ended before its end.
+bool Replay(Ink::InkSession& session, const Ink::Recording& recording,
+            const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace);
+
+#endif

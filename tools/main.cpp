@@ -1,0 +1,50 @@
+#include "DrawCommand.h"
+#include "Recording.h"
+#include "UserError.h"
+
+#include <CLI/CLI.hpp>
+
+#include <cstdio>
+#include <exception>
+
+namespace
+{
+
+constexpr int kUserErrorStatus = 2;
+
+int Fail(const std::exception& failure)
+{
+    std::fprintf(stderr, "nib: %s\n", failure.what());
+    return kUserErrorStatus;
+}
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    CLI::App app("Draw with NibRenderer from the command line", "nib");
+    app.set_version_flag("--version", std::string("nib ") + NIB_VERSION);
+    app.require_subcommand(1);
+    AddDrawCommand(app);
+    try
+    {
+        app.parse(argc, argv);
+    }
+    catch (const CLI::CallForHelp& help)
+    {
+        return app.exit(help);
+    }
+    catch (const CLI::CallForVersion& version)
+    {
+        return app.exit(version);
+    }
+    catch (const CLI::ParseError& failure)
+    {
+        return Fail(failure);
+    }
+    catch (const std::exception& failure) // Ink::ReadError, UserError, and what the library throws
+    {
+        return Fail(failure);
+    }
+    return 0;
+}
