@@ -11,6 +11,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <cstdio>
 #include <cstdlib>
 #include <memory>
 #include <optional>
@@ -142,11 +143,12 @@ public:
             if (window)
                 session.AttachWindow(window->NativeWindow());
             CheckFor(session.Error());
-            const bool wasShown = Draw(session, window.get());
+            const Figures figures = Draw(session, window.get());
             CheckFor(session.Error());
             if (!m_options.output.empty())
                 WritePng(m_options.output, session.ReadPixels(), m_size.width, m_size.height);
-            if (window && wasShown && m_options.keep)
+            Print(figures);
+            if (window && m_options.keep)
                 WaitUntilClosed(*window);
         }
         if (window)
@@ -154,7 +156,7 @@ public:
     }
 
 private:
-    bool Draw(Ink::InkSession& session, XWindow* window)
+    Figures Draw(Ink::InkSession& session, XWindow* window)
     {
         Pace pace;
         if (window)
@@ -165,6 +167,13 @@ private:
             pace.isWanted = [window] { return window->IsOpen(); };
         }
         return Replay(session, m_recording, m_placement, m_style, pace);
+    }
+
+    static void Print(const Figures& figures)
+    {
+        std::printf("%d strokes, %d samples, %d frames\n", figures.strokes, figures.samples,
+                    figures.frames);
+        std::fflush(stdout);
     }
 
     static void WaitUntilClosed(XWindow& window)

@@ -32,27 +32,32 @@ private:
 
 } // namespace
 
-bool Replay(Ink::InkSession& session, const Ink::Recording& recording,
-            const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace)
+Figures Replay(Ink::InkSession& session, const Ink::Recording& recording,
+               const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace)
 {
     const double firstTime = recording.strokes.front().front().time;
     const Pacer pacer(pace.speed, firstTime);
     Ink::StrokeMesh mesh;
     std::vector<Ink::Vertex> piece;
+    Figures figures;
     const auto draw = [&]
     {
         session.Draw(std::exchange(piece, {}), style.colour);
-        if (pace.framePerSample)
-            session.Present();
+        if (!pace.framePerSample)
+            return;
+        session.Present();
+        ++figures.frames;
     };
     for (const Ink::Stroke& stroke : recording.strokes)
     {
+        ++figures.strokes;
         mesh.Begin();
         for (const Ink::Sample& sample : stroke)
         {
             if (pace.isWanted && !pace.isWanted())
-                return false;
+                return figures;
             pacer.WaitFor(sample.time);
+            ++figures.samples;
             mesh.Add(Ink::ToPage(sample, placement, style), piece);
             if (&sample == &stroke.back())
                 mesh.End(piece);
@@ -60,5 +65,5 @@ bool Replay(Ink::InkSession& session, const Ink::Recording& recording,
                 draw();
         }
     }
-    return true;
+    return figures;
 }

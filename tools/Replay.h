@@ -15,8 +15,17 @@ struct Pace
     std::function<bool()> isWanted; ///< asked before each sample; false ends the replay
 };
 
-/// Draws @p recording into @p session, sample by sample. False when it was ended before its end.
-bool Replay(Ink::InkSession& session, const Ink::Recording& recording,
-            const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace);
+/// What a replay has done.
+struct Figures
+{
+    int strokes = 0;
+    int samples = 0;
+    int frames = 0;
+};
+
+/// Draws @p recording into @p session, sample by sample, to its end or until it is no longer
+/// wanted.
+Figures Replay(Ink::InkSession& session, const Ink::Recording& recording,
+               const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace);
 
 #endif
