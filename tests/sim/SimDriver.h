@@ -35,7 +35,7 @@ enum class SimPace
     OnWait,  ///< a fence is passed by the first wait for it that has a time-out above 0, or by
              ///< glFinish
     Held,    ///< nothing is done until ReleaseGpu(): waits with a time-out expire at once, waits
-          ///< without one and glFinish block
+             ///< without one and glFinish block
 };
 
 /// What android_property_get finds behind "libc.so".
@@ -96,9 +96,9 @@ public:
     /// glGetString null. glCheckFramebufferStatus answers @p error itself; a failed log, window or
     /// system call returns -1.
     void FailNext(const char* name, unsigned error, int times = 1);
-    /// As FailNext, for calls whose argument @p index is @p value: one attribute of
-    /// eglQuerySurface, say.
-    void FailWhen(const char* name, std::size_t index, long long value, unsigned error,
+    /// As FailNext, for calls whose argument @p index is @p value: an attribute of eglQuerySurface,
+    /// a name asked of eglGetProcAddress.
+    void FailWhen(const char* name, std::size_t index, const SimValue& value, unsigned error,
                   int times = 1);
     /// Refuses the call number @p n (from 1) since ForgetCalls or the start, whatever it is.
     void FailAt(std::size_t n, unsigned eglError = EGL_BAD_ALLOC,
