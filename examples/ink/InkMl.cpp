@@ -1,6 +1,7 @@
 #include "InkMl.h"
 
 #include "InkMlTrace.h"
+#include "RecordingBuilder.h"
 
 #include <pugixml.hpp>
 
@@ -55,7 +56,7 @@ public:
         CollectTraces(root);
         if (m_recording.strokes.empty())
             Fail(root.offset_debug(), "there is no trace in it");
-        Normalise();
+        ScalePressures(m_recording);
         return std::move(m_recording);
     }
 
@@ -168,8 +169,7 @@ private:
         Walk(root,
              [this](const pugi::xml_node& node)
              {
-                 if (LocalName(node) == "trace" &&
-                     std::string_view(node.attribute("type").value()) != "penUp")
+                 if (LocalName(node) == "trace")
                      AddTrace(node);
              });
     }
@@ -180,34 +180,24 @@ private:
         TraceDecoder decoder(format);
         Stroke stroke;
         std::string problem;
-        if (!decoder.Decode(node.text().get(), stroke, problem))
+        if (!decoder.Decode(node.text().get(), kMostSamples - m_count, stroke, problem))
             Fail(node.text().data().offset_debug(), problem);
         if (stroke.empty())
             Fail(node.offset_debug(), "the trace has no point");
-        m_hasTime = m_hasTime || format.Has("T");
-        m_recording.strokes.push_back(std::move(stroke));
+        m_count += stroke.size();
+        GoOnFrom(stroke, format.Has("T"));
+        const bool isAbove = std::string_view(node.attribute("type").value()) == "penUp";
+        (isAbove ? m_recording.hovers : m_recording.strokes).push_back(std::move(stroke));
     }
 
-    /// Brings pressures without a stated range to 0..1 and gives a recording without times a steady
-    /// rate, so that it can be replayed.
-    void Normalise()
+    /// Makes the times of @p stroke follow on those before: some files count the time of each trace
+    /// from zero, and some have none, which get a steady rate.
+    void GoOnFrom(Stroke& stroke, bool hasTime)
     {
-        float greatest = 1.0f;
-        for (const Stroke& stroke : m_recording.strokes)
-            for (const Sample& sample : stroke)
-                greatest = std::max(greatest, sample.pressure);
-        double time = 0.0;
-        for (Stroke& stroke : m_recording.strokes)
-        {
-            // Some files count the time of each trace from zero.
-            const double shift = std::max(0.0, time - stroke.front().time);
-            for (Sample& sample : stroke)
-            {
-                sample.pressure = std::clamp(sample.pressure / greatest, 0.0f, 1.0f);
-                time = m_hasTime ? std::max(time, sample.time + shift) : time + kSteadyRate;
-                sample.time = time;
-            }
-        }
+        const double shift = std::max(0.0, m_time - stroke.front().time);
+        for (Sample& sample : stroke)
+            sample.time = m_time =
+                hasTime ? std::max(m_time, sample.time + shift) : m_time + kSteadyRate;
     }
 
     static constexpr double kSteadyRate = 0.008;
@@ -219,7 +209,8 @@ private:
     std::map<std::size_t, TraceFormat> m_formatsByNode;
     std::map<std::string, pugi::xml_node, std::less<>> m_contexts;
     std::optional<TraceFormat> m_firstFormat;
-    bool m_hasTime = false;
+    double m_time = 0.0;
+    std::size_t m_count = 0;
 };
 
 } // namespace

@@ -1,5 +1,7 @@
 #include "InkMlTrace.h"
 
+#include "RecordingBuilder.h"
+
 #include <algorithm>
 #include <charconv>
 #include <cmath>
@@ -49,7 +51,8 @@ TraceDecoder::TraceDecoder(const TraceFormat& format)
     m_states.resize(m_channels.size());
 }
 
-bool TraceDecoder::Decode(std::string_view text, Stroke& stroke, std::string& problem)
+bool TraceDecoder::Decode(std::string_view text, std::size_t most, Stroke& stroke,
+                          std::string& problem)
 {
     text = Trimmed(text);
     while (!text.empty())
@@ -61,6 +64,11 @@ bool TraceDecoder::Decode(std::string_view text, Stroke& stroke, std::string& pr
         if (!std::isfinite(sample.x) || !std::isfinite(sample.y) || !std::isfinite(sample.time))
         {
             problem = "a value of a point is out of range";
+            return false;
+        }
+        if (stroke.size() == most)
+        {
+            problem = "more than 4000000 samples";
             return false;
         }
         stroke.push_back(sample);
@@ -153,6 +161,7 @@ void TraceDecoder::Accept(ChannelState& state, double number) const
 Sample TraceDecoder::ToSample() const
 {
     Sample sample;
+    float tiltX = 0.0f, tiltY = 0.0f;
     for (std::size_t i = 0; i < m_channels.size(); ++i)
     {
         const Channel& channel = m_channels[i];
@@ -168,7 +177,16 @@ Sample TraceDecoder::ToSample() const
                 std::clamp((value - channel.min) / (channel.max - channel.min), 0.0, 1.0));
         else if (channel.name == "F")
             sample.pressure = static_cast<float>(std::max(value, 0.0));
+        else if (channel.name == "OTx")
+            tiltX = static_cast<float>(value);
+        else if (channel.name == "OTy")
+            tiltY = static_cast<float>(value);
+        else if (channel.name == "OA")
+            sample.azimuth = static_cast<float>(value);
+        else if (channel.name == "OE")
+            sample.altitude = static_cast<float>(value);
     }
+    SetTilt(sample, tiltX, tiltY);
     return sample;
 }
 

@@ -39,9 +39,9 @@ class TraceDecoder
 public:
     explicit TraceDecoder(const TraceFormat& format);
 
-    /// Appends the points of @p text to @p stroke. False, with the reason in @p problem, when the
-    /// text is not a trace of this format.
-    bool Decode(std::string_view text, Stroke& stroke, std::string& problem);
+    /// Appends the points of @p text to @p stroke, @p most at most. False, with the reason in
+    /// @p problem, when the text is not a trace of this format.
+    bool Decode(std::string_view text, std::size_t most, Stroke& stroke, std::string& problem);
 
 private:
     enum class Encoding

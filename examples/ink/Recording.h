@@ -12,19 +12,23 @@ namespace Ink
 /// One report of the pen.
 struct Sample
 {
-    double time = 0.0;     ///< seconds since the recording began; never decreases within a stroke
-    float x = 0.0f;        ///< the recording's own unit, growing to the right
-    float y = 0.0f;        ///< the recording's own unit, growing downward
-    float pressure = 0.5f; ///< 0 (barely touching) to 1; 0.5 where the recording has none
+    double time = 0.0;      ///< seconds since some moment; never decreases within a recording
+    float x = 0.0f;         ///< the recording's own unit, growing to the right
+    float y = 0.0f;         ///< the recording's own unit, growing downward
+    float pressure = 0.5f;  ///< 0 (barely touching) to 1; 0.5 where the recording has none
+    float altitude = 90.0f; ///< degrees between pen and page: 90 upright, 0 flat
+    float azimuth =
+        0.0f; ///< degrees, 0 to 360, from the page's right, clockwise: where the pen leans
 };
 
-/// What the pen wrote between touching the page and leaving it.
+/// A run of samples without a gap.
 using Stroke = std::vector<Sample>;
 
-/// The strokes of one file, in the order in which they were written.
+/// What one file holds.
 struct Recording
 {
-    std::vector<Stroke> strokes;
+    std::vector<Stroke> strokes; ///< what the pen wrote, in order; each has at least one sample
+    std::vector<Stroke> hovers;  ///< how it moved above the page, where the recording tells
 };
 
 /// A file that is not a recording, or not a whole one. what() is "FILE:LINE: what is wrong".
@@ -37,8 +41,13 @@ public:
     }
 };
 
-/// Reads @p path, whose format is recognised by its content: W3C InkML, or a pen log of one sample
-/// a line (see PenLog.h). Throws ReadError.
+/// Reads @p path, whose format is recognised by its content. Throws ReadError. The formats:
+/// - W3C InkML (InkMl.h);
+/// - a pen log, one sample a line (PenLog.h);
+/// - tablet samples behind their count (SvcFile.h);
+/// - JSON, of pointer events or of named lists of points (InkJson.h);
+/// - strokes between the words START and BREAK (StrokeList.h).
+/// A file may have 128 MiB and 4,000,000 samples.
 Recording ReadRecording(const std::string& path);
 
 } // namespace Ink

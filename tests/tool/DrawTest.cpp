@@ -212,13 +212,13 @@ TEST_F(Draw, BadFilesAreOneLineAndNoPicture)
     const std::string in = m_folder.Path("in");
     EXPECT_EQ(ErrorOf(""), "nib: " + in + ":1: the file is empty\n");
     EXPECT_EQ(ErrorOf("hello\n"),
-              "nib: " + in + ":1: a number was expected: this is no recording of a pen\n");
+              "nib: " + in + ":1: four numbers were expected: this is no recording of a pen\n");
     EXPECT_EQ(ErrorOf("0 1 2 0.5\n0 1"),
               "nib: " + in + ":2: the last line is cut short: its end of line is missing\n");
     EXPECT_EQ(ErrorOf("<svg/>"),
               "nib: " + in + ":1: not InkML: the outermost element is not <ink>\n");
     EXPECT_EQ(ErrorOf(std::string("\x89PNG\r\n\x1a\n", 8)),
-              "nib: " + in + ":1: a number was expected: this is no recording of a pen\n");
+              "nib: " + in + ":1: four numbers were expected: this is no recording of a pen\n");
 }
 
 TEST_F(Draw, MissingFileIsNamed)
