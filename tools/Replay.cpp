@@ -61,8 +61,10 @@ Figures Replay(Ink::InkSession& session, const Ink::Recording& recording,
             mesh.Add(Ink::ToPage(sample, placement, style), piece);
             if (&sample == &stroke.back())
                 mesh.End(piece);
-            if (pace.framePerSample || &sample == &stroke.back())
+            if (pace.framePerSample || pace.afterSample || &sample == &stroke.back())
                 draw();
+            if (pace.afterSample)
+                pace.afterSample(figures.samples);
         }
     }
     return figures;

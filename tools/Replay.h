@@ -10,9 +10,10 @@
 /// When a replay shows a frame, and how fast it runs.
 struct Pace
 {
-    double speed = 0.0;             ///< times the recorded speed; 0: as fast as it goes
-    bool framePerSample = false;    ///< present after every sample, else not at all
-    std::function<bool()> isWanted; ///< asked before each sample; false ends the replay
+    double speed = 0.0;                   ///< times the recorded speed; 0: as fast as it goes
+    bool framePerSample = false;          ///< present after every sample, else not at all
+    std::function<void(int)> afterSample; ///< told the number of samples drawn so far; may be null
+    std::function<bool()> isWanted;       ///< asked before each sample; false ends the replay
 };
 
 /// What a replay has done.

@@ -93,6 +93,22 @@ void InkSession::Present()
     m_thread.Render();
 }
 
+void InkSession::LoseContext()
+{
+    auto pixels = std::make_shared<std::vector<std::uint8_t>>();
+    PostGuarded([pixels](GlState& gl) { *pixels = gl.page->Suspend(); });
+    m_thread.OnPause(); // behind the task above; the objects let go of their GL names
+
+    m_thread.OnResume(); // the objects get new names, their contents are ours to bring
+    PostGuarded(
+        [pixels](GlState& gl)
+        {
+            gl.page->Resume(*pixels);
+            gl.painter->RestoreContents();
+        });
+    m_thread.GetMsgQueue()->waitForCompleting(); // OnResume itself does not wait for the context
+}
+
 std::vector<std::uint8_t> InkSession::ReadPixels()
 {
     auto pixels = std::make_shared<std::vector<std::uint8_t>>();

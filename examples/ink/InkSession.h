@@ -37,6 +37,11 @@ public:
     /// Shows what changed since the last frame. [blocks] until the frame is presented.
     void Present();
 
+    /// Has the render thread lose its context and get a new one, as an application does that goes
+    /// into the background: everything on the page is kept. Only on threads that can be paused
+    /// (offscreen ones with a parent). [blocks]
+    void LoseContext();
+
     /// The page as it is now: RGBA, premultiplied, top row first. [blocks]
     std::vector<std::uint8_t> ReadPixels();
 

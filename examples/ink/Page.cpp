@@ -27,6 +27,19 @@ void Page::Clear()
                          m_paper.blue * m_paper.alpha, m_paper.alpha);
 }
 
+std::vector<std::uint8_t> Page::Suspend()
+{
+    std::vector<std::uint8_t> pixels = ReadPixels();
+    m_target.reset();
+    return pixels;
+}
+
+void Page::Resume(const std::vector<std::uint8_t>& pixels)
+{
+    m_texture->Update(pixels.data(), 0);
+    m_target.reset(Nib::RendererFactory::CreateOffscreenRenderTarget(m_texture.get()));
+}
+
 void Page::Draw(InkPainter& painter, const std::vector<Vertex>& triangles, const Colour& colour)
 {
     m_target->Activate();

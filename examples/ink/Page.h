@@ -26,6 +26,14 @@ public:
     Nib::ITextureObject& Texture() { return *m_texture; }
 
     void Clear();
+
+    /// Before the context is lost: gives the pixels out and lets go of the render target, whose
+    /// name dies with the context.
+    std::vector<std::uint8_t> Suspend();
+
+    /// With the new context: puts @p pixels, as Suspend gave them, back onto the page.
+    void Resume(const std::vector<std::uint8_t>& pixels);
+
     void Draw(InkPainter& painter, const std::vector<Vertex>& triangles, const Colour& colour);
 
     /// The pixels, RGBA with premultiplied alpha, top row first.

@@ -1,0 +1,149 @@
+#include "Drawing.h"
+
+#include "FrontBuffer.h"
+#include "PageExport.h"
+#include "PngFile.h"
+#include "UserError.h"
+
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <optional>
+#include <thread>
+
+namespace
+{
+
+constexpr Ink::Colour kPaper{1.0f, 1.0f, 1.0f, 1.0f};
+
+/// All files as one recording, each behind the one before.
+Ink::Recording ReadRecordings(const std::vector<std::string>& files)
+{
+    Ink::Recording all;
+    double end = 0.0;
+    for (const std::string& file : files)
+    {
+        Ink::Recording one = Ink::ReadRecording(file);
+        const double shift = end - one.strokes.front().front().time;
+        for (Ink::Stroke& stroke : one.strokes)
+        {
+            for (Ink::Sample& sample : stroke)
+                sample.time += shift;
+            end = stroke.back().time;
+            all.strokes.push_back(std::move(stroke));
+        }
+    }
+    return all;
+}
+
+void CheckEgl()
+{
+    if (Nib::Egl::GetEglStatus() != 0 || !Nib::Egl::GetInstance()->GetConfig(false))
+        throw UserError("EGL does not start here: no driver, or none with an RGBA8888 "
+                        "configuration (NIB_LOG=info tells more)");
+}
+
+void CheckFor(const std::string& failure)
+{
+    if (!failure.empty())
+        throw UserError("drawing failed: " + failure);
+}
+
+void Print(const Figures& figures)
+{
+    std::printf("%d strokes, %d samples, %d frames\n", figures.strokes, figures.samples,
+                figures.frames);
+    std::fflush(stdout);
+}
+
+void WaitUntilClosed(XWindow& window)
+{
+    while (window.IsOpen())
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+}
+
+} // namespace
+
+Drawing::Drawing(const DrawOptions& options)
+    : m_options(options), m_size(ParseSize(options.size)), m_speed(ParseSpeed(options.speed)),
+      m_loseContextEvery(ParseLoseContext(options.loseContext)),
+      m_recording(ReadRecordings(options.files))
+{
+    if (options.scale == "fit")
+        m_placement = Ink::FitToPage(m_recording, m_size.width, m_size.height);
+}
+
+void Drawing::Run()
+{
+    std::unique_ptr<XWindow> window;
+    if (m_options.window)
+        window = std::make_unique<XWindow>("nib draw", m_size.width, m_size.height);
+    else
+        setenv("EGL_PLATFORM", "surfaceless", 0); // no display server is needed
+    CheckEgl();
+
+    const std::unique_ptr<Nib::RenderThreadGL> parent = StartWindowThread();
+    std::unique_ptr<Nib::RenderThreadGL> child; // ended before its parent
+    if (m_loseContextEvery != 0)
+        child.reset(
+            Nib::RendererFactory::CreateOffscreenRenderer(parent->GetMsgQueue(), "nib page", true));
+    else if (m_options.frontBuffer)
+        child = FrontBufferThread(*parent);
+    if (child && !child->Start())
+        throw UserError("the render thread does not start");
+    DrawOn(child ? *child : *parent, *parent, window.get());
+}
+
+std::unique_ptr<Nib::RenderThreadGL> Drawing::StartWindowThread() const
+{
+    std::unique_ptr<Nib::RenderThreadGL> thread(
+        Nib::RendererFactory::CreateSurfaceRenderer("nib draw", Nib::RenderThreadGL::High));
+    if (!thread->Start())
+        throw UserError("the render thread does not start");
+    return thread;
+}
+
+void Drawing::DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent,
+                     XWindow* window) const
+{
+    std::optional<PageExport> pages; // ends behind the session: its thread is a child, too
+    if (m_options.exportedPages != 0)
+        pages.emplace(parent, m_options.output, m_options.exportedPages);
+
+    Ink::InkSession session(thread, m_size.width, m_size.height, kPaper);
+    if (window)
+        session.AttachWindow(window->NativeWindow());
+    CheckFor(session.Error());
+    if (pages)
+        pages->Start(m_recording, m_placement, m_style, m_size, kPaper);
+    const Figures figures = Play(session, window);
+    CheckFor(session.Error());
+    if (pages)
+        CheckFor(pages->Finish());
+    if (!m_options.output.empty())
+        WritePng(m_options.output, session.ReadPixels(), m_size.width, m_size.height);
+    Print(figures);
+    if (window && m_options.keep)
+        WaitUntilClosed(*window);
+    if (window)
+        thread.OnSurfaceDestroyed();
+}
+
+Figures Drawing::Play(Ink::InkSession& session, XWindow* window) const
+{
+    Pace pace;
+    if (window)
+    {
+        session.Present(); // the empty page
+        pace.speed = m_speed;
+        pace.framePerSample = true;
+        pace.isWanted = [window] { return window->IsOpen(); };
+    }
+    if (m_loseContextEvery != 0)
+        pace.afterSample = [&session, every = m_loseContextEvery](int samples)
+        {
+            if (samples % every == 0)
+                session.LoseContext();
+        };
+    return Replay(session, m_recording, m_placement, m_style, pace);
+}

@@ -1,0 +1,36 @@
+#ifndef NIB_TOOLS_DRAWING_H
+#define NIB_TOOLS_DRAWING_H
+
+#include "DrawOptions.h"
+#include "InkSession.h"
+#include "PenStyle.h"
+#include "Recording.h"
+#include "Replay.h"
+#include "XWindow.h"
+
+#include <nib/nib.h>
+
+#include <memory>
+
+/// One run of `nib draw`. Throws UserError and Ink::ReadError.
+class Drawing
+{
+public:
+    explicit Drawing(const DrawOptions& options); ///< reads the files
+    void Run();
+
+private:
+    std::unique_ptr<Nib::RenderThreadGL> StartWindowThread() const;
+    void DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent, XWindow* window) const;
+    Figures Play(Ink::InkSession& session, XWindow* window) const;
+
+    const DrawOptions& m_options;
+    PageSize m_size;
+    double m_speed;
+    int m_loseContextEvery;
+    Ink::Recording m_recording;
+    Ink::Placement m_placement;
+    Ink::PenStyle m_style;
+};
+
+#endif

@@ -1,0 +1,32 @@
+#include "FrontBuffer.h"
+
+#include <cstdio>
+#include <string>
+
+namespace
+{
+
+/// Why Nib::IsFBRSupported() says no, in its order.
+std::string Obstacle()
+{
+    const Nib::Egl& egl = *Nib::Egl::GetInstance();
+    for (const char* extension :
+         {"EGL_KHR_mutable_render_buffer", "EGL_KHR_fence_sync", "EGL_ANDROID_get_frame_timestamps",
+          "EGL_ANDROID_presentation_time"})
+        if (!egl.IsEglExtensionSupported(extension))
+            return std::string("the display has no ") + extension;
+    if (!egl.HasFrontBufferConfig())
+        return "no configuration has a mutable render buffer";
+    return "it is known not to work on this GPU";
+}
+
+} // namespace
+
+std::unique_ptr<Nib::RenderThreadGL> FrontBufferThread(Nib::RenderThreadGL& parent)
+{
+    if (Nib::IsFBRSupported())
+        return std::unique_ptr<Nib::RenderThreadGL>(
+            Nib::RendererFactory::CreateFBRSurfaceRenderer(parent.GetMsgQueue(), "nib front"));
+    std::fprintf(stderr, "nib: --front-buffer: %s; drawing frames instead\n", Obstacle().c_str());
+    return nullptr;
+}

@@ -1,0 +1,12 @@
+#ifndef NIB_TOOLS_FRONT_BUFFER_H
+#define NIB_TOOLS_FRONT_BUFFER_H
+
+#include <nib/nib.h>
+
+#include <memory>
+
+/// A front-buffer render thread beside @p parent, not started; null, after one line on standard
+/// error that says why, where the device cannot have one.
+std::unique_ptr<Nib::RenderThreadGL> FrontBufferThread(Nib::RenderThreadGL& parent);
+
+#endif
