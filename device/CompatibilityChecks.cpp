@@ -1,15 +1,13 @@
 #include "base/Log.h"
 #include "base/ThreadAnnotations.h"
+#include "device/CheckTask.h"
 #include "device/GlText.h"
 
 #include <nib/base.h>
 #include <nib/device.h>
 #include <nib/egl.h>
-#include <nib/msg_queue.h>
 #include <nib/render_thread.h>
-#include <nib/task.h>
 
-#include <memory>
 #include <string>
 #include <unordered_map>
 
@@ -51,17 +49,13 @@ void LogAnswer(const char* function, bool answer)
     NIB_LOG_INFO("%s = %s", function, answer ? "true" : "false");
 }
 
-/// Runs @p check on the shared render thread and waits for it, unless that was done before. A task
-/// that the thread does not take leaves the result as it is; it is not tried again.
+/// Runs @p check on the shared render thread, unless that was done before; never again, even if
+/// the thread did not take it.
 void RunOnce(void (*check)(bool*), CachedCheck& cache) NIB_REQUIRES(g_checkLock)
 {
     if (cache.checked)
         return;
-    IGLMsgQueue* queue = RenderThreadGLST::getInstance()->GetMsgQueue();
-    auto task = std::make_unique<WorkerTask::Func1<void (*)(bool*), bool*>>(check, &cache.result);
-    if (queue->enQueueMsg(task.get()))
-        task.release(); // the queue's from here on
-    queue->waitForCompleting();
+    RunCheck(*RenderThreadGLST::getInstance()->GetMsgQueue(), check, &cache.result);
     RenderThreadGLST::release();
     cache.checked = true;
 }
