@@ -98,7 +98,7 @@ TEST(OpenGlState, StoreAsksForEverythingInOrder)
                              "glGetVertexAttribiv",      "glGetVertexAttribiv",
                              "glGetVertexAttribPointerv"};
     const Texts queries = Queries(device.driver);
-    ASSERT_EQ(queries.size(), 18u + 4u * 3u + 1u + 5u * 7u);
+    ASSERT_EQ(queries.size(), 17u + 4u * 3u + 1u + 5u * 7u);
     EXPECT_EQ(Texts(queries.begin(), queries.begin() + 31),
               (Texts{
                   "glGetError",
