@@ -94,12 +94,13 @@ public:
 private:
     Egl();
 
-    bool ChooseConfigs();
+    bool ChooseMatching(const EGLint* attributes, int total, EGLConfig* out) const;
 
     EGLDisplay m_display;
     EGLConfig m_config;
     EGLConfig m_frontBufferConfig;
     std::int32_t m_status;
+    bool m_ordinaryForFrontBuffer; // a desktop fallback
 };
 
 /// Owns one EGL context. Belongs to one render thread, which alone makes, uses and destroys it.

@@ -1,0 +1,66 @@
+#include <nib/egl.h>
+
+#include "base/Log.h"
+#include "egl/EglTokens.h"
+
+namespace Nib
+{
+
+bool EglContext::Create(const EGLContext shareContext, bool enableFrontBuffer, Priority priority)
+{
+    NIB_FUNCTION("bool Nib::EglContext::Create(const EGLContext, bool, Nib::EglContext::Priority)");
+    const Egl* egl = Egl::GetInstance();
+
+    EGLint version = 3;
+    if (shareContext != EGL_NO_CONTEXT)
+    {
+        eglQueryContext(egl->GetDisplay(), shareContext, EGL_CONTEXT_CLIENT_VERSION, &version);
+        NIB_LOG_INFO("%s, Shared context client version %i", function, version);
+    }
+
+    EGLint attributes[] = {EGL_CONTEXT_CLIENT_VERSION, version, EGL_NONE, EGL_NONE, EGL_NONE};
+    if (egl->IsEglExtensionSupported("EGL_IMG_context_priority"))
+    {
+        NIB_LOG_INFO("%s, Create context with priority: 0x%x", function,
+                     static_cast<unsigned>(priority));
+        attributes[2] = EGL_CONTEXT_PRIORITY_LEVEL_IMG;
+        attributes[3] = static_cast<EGLint>(priority);
+    }
+
+    const EGLConfig config = egl->GetConfig(enableFrontBuffer);
+    if (config == nullptr)
+    {
+        NIB_LOG_ERROR("%s - required config is NULL (enableFrontBuffer = %s)", function,
+                      enableFrontBuffer ? "true" : "false");
+        return false;
+    }
+    m_context = eglCreateContext(egl->GetDisplay(), config, shareContext, attributes);
+    if (m_context == EGL_NO_CONTEXT)
+    {
+        NIB_LOG_ERROR("%s: eglCreateContext. Error:%d", function, eglGetError());
+        return false;
+    }
+    return true;
+}
+
+void EglContext::Destroy()
+{
+    NIB_FUNCTION("void Nib::EglContext::Destroy()");
+    NIB_LOG_INFO("%s", function);
+    if (m_context == EGL_NO_CONTEXT)
+        return;
+    eglDestroyContext(Egl::GetInstance()->GetDisplay(), m_context);
+    m_context = EGL_NO_CONTEXT;
+}
+
+EglContext::~EglContext()
+{
+    Destroy();
+}
+
+EGLContext EglContext::Get() const
+{
+    return m_context;
+}
+
+} // namespace Nib
