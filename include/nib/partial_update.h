@@ -123,6 +123,11 @@ public:
     int GetScreenHeight() const;      ///< of the surface, in pixels
 
 private:
+    friend struct UpdateRectangleModes; // a test's way to modes that no device has
+
+    void RestrictToDirtyArea(const RectF& dirty, int rotation);
+    void LogDamageRegionError() const;
+
     EglSurface* m_surface; // not owned
     int m_hwRotation;      // quarter turns
     int m_screenWidth;
