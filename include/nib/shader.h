@@ -20,7 +20,7 @@ namespace Nib
 enum class BindingType : int32_t
 {
     Undefined = 0,    ///< carries nothing
-    Bool = 1,         ///< GL_BOOL: one byte
+    Bool = 1,         ///< GL_BOOL: one byte, false when 0
     Matrix4 = 2,      ///< GL_FLOAT_MAT4: 16 floats, column after column
     Vector2 = 3,      ///< GL_FLOAT_VEC2: 2 floats
     Vector3 = 4,      ///< GL_FLOAT_VEC3: 3 floats
@@ -58,8 +58,8 @@ public:
 
 protected:
     const BindingType m_type;
-    bool m_boolValue = false;
-    int32_t m_intValue = 0; ///< of Int, Sampler and UniformBlock
+    unsigned char m_boolValue = 0; ///< the byte as it was given: GL takes any but 0 for true
+    int32_t m_intValue = 0;        ///< of Int, Sampler and UniformBlock
     float m_floatValue = 0.0f;
     float m_vector2Value[2] = {};
     float m_vector3Value[3] = {};

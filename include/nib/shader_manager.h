@@ -76,8 +76,8 @@ private:
 
     static ShaderManager m_instance;
 
+    bool TakeDestroyedContext(IGLMsgQueue* queue, void** context);
     Shaders TakeShadersOf(void* context);
-    void RegisterAnew(const Shaders& shaders, void* context);
 
     // Registration is serialised by the first lock. The context operations must not wait for
     // registering code, so what is really shared, the maps, has a lock of its own, held for no more

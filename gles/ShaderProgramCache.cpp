@@ -1,0 +1,343 @@
+#include "base/Log.h"
+#include "gles/BinaryShaderFile.h"
+
+#include <nib/shader_cache.h>
+
+#include <algorithm>
+#include <atomic>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <utility>
+
+#include <unistd.h>
+
+namespace Nib
+{
+
+namespace
+{
+
+/// A name beside @p path that no other thread or process uses.
+std::string TemporaryName(const std::string& path)
+{
+    static std::atomic<unsigned> counter{0};
+    return path + "." + std::to_string(getpid()) + "." +
+           std::to_string(counter.fetch_add(1, std::memory_order_relaxed)) + ".tmp";
+}
+
+std::uint64_t CrcOfText(std::uint64_t crc, const char* text)
+{
+    return text == nullptr ? crc : ContinueCrc(crc, text, std::strlen(text));
+}
+
+} // namespace
+
+// ---- one record ---------------------------------------------------------------------------------
+
+ShaderProgramCache::BinaryShader::BinaryShader(BinaryShader&& other) noexcept
+    : key(other.key), length(std::exchange(other.length, 0)), format(other.format),
+      bytes(std::exchange(other.bytes, nullptr)), attributes(std::move(other.attributes))
+{
+}
+
+ShaderProgramCache::BinaryShader&
+ShaderProgramCache::BinaryShader::operator=(BinaryShader&& other) noexcept
+{
+    std::swap(key, other.key);
+    std::swap(length, other.length);
+    std::swap(format, other.format);
+    std::swap(bytes, other.bytes);
+    std::swap(attributes, other.attributes);
+    return *this;
+}
+
+ShaderProgramCache::BinaryShader::~BinaryShader()
+{
+    delete[] bytes;
+}
+
+ShaderProgramCache::BinaryShader* ShaderProgramCache::BinaryShader::Clone() const
+{
+    auto clone = std::make_unique<BinaryShader>();
+    clone->key = key;
+    clone->length = length;
+    clone->format = format;
+    clone->attributes = attributes;
+    const auto size = static_cast<std::size_t>(std::max(length, 0));
+    clone->bytes = new unsigned char[size];
+    std::copy_n(bytes, size, clone->bytes);
+    return clone.release();
+}
+
+// ---- the one cache ------------------------------------------------------------------------------
+
+std::unique_ptr<ShaderProgramCache> ShaderProgramCache::m_instance;
+std::atomic<ShaderProgramCache*> ShaderProgramCache::m_published{nullptr};
+CriticalSection ShaderProgramCache::m_instanceGuard{true};
+
+ShaderProgramCache* ShaderProgramCache::GetInstance()
+{
+    // Acquire, paired with the release below: who sees the pointer sees the cache ready.
+    if (ShaderProgramCache* instance = m_published.load(std::memory_order_acquire))
+        return instance;
+    AutoCriticalSection lock(m_instanceGuard);
+    if (!m_instance)
+    {
+        m_instance.reset(new ShaderProgramCache);
+        m_instance->Init(); // an instance without a folder is kept, too
+        m_published.store(m_instance.get(), std::memory_order_release);
+    }
+    return m_instance.get();
+}
+
+ShaderProgramCache::ShaderProgramCache() : m_initialized(false), m_lock(false) {}
+
+ShaderProgramCache::~ShaderProgramCache() = default;
+
+bool ShaderProgramCache::Init()
+{
+    NIB_FUNCTION("bool Nib::ShaderProgramCache::Init()");
+    AutoCriticalSection lock(m_lock);
+    if (m_initialized)
+    {
+        NIB_LOG_WARN("%s - Already initialized.", function);
+        return true;
+    }
+    const char* const path = System::GetSDKCacheDirectoryPath();
+    if (path == nullptr || *path == '\0')
+    {
+        NIB_LOG_ERROR("%s - SDK cache path is NULL or empty", function);
+        return false;
+    }
+    m_cacheDirectory = path;
+    const std::size_t delimiter = m_cacheDirectory.find_last_of("/\\");
+    if (delimiter == std::string::npos)
+        NIB_LOG_ERROR("%s Path delimiter not found in given Cache path", function);
+    else
+        m_cacheDirectory = m_cacheDirectory.substr(0, delimiter) + "/RendererCache";
+
+    const char* const directory = m_cacheDirectory.c_str();
+    if (File::IsAccessible(directory, 0) != 0)
+    {
+        NIB_LOG_INFO("%s - Make cache directory: %s", function, directory);
+        if (Directory::MakeDirectory(directory) != 0)
+        {
+            NIB_LOG_ERROR("%s : Fail to make the shader cache directory. errno = %d", function,
+                          errno);
+            return false;
+        }
+    }
+    m_initialized = true;
+    return true;
+}
+
+// ---- keys ---------------------------------------------------------------------------------------
+
+ShaderProgramCache::BinaryShaderKey ShaderProgramCache::GetShaderKey(const char* vs, const char* fs)
+{
+    return CrcOfText(CrcOfText(0, vs), fs);
+}
+
+ShaderProgramCache::BinaryShaderKey ShaderProgramCache::Append(BinaryShaderKey key,
+                                                               const char* text)
+{
+    return CrcOfText(key, text);
+}
+
+// ---- finding and storing ------------------------------------------------------------------------
+
+const ShaderProgramCache::BinaryShader* ShaderProgramCache::GetBinaryShader(BinaryShaderKey key)
+{
+    return HoldBinaryShader(key).get(); // the map holds it, too
+}
+
+std::shared_ptr<const ShaderProgramCache::BinaryShader>
+ShaderProgramCache::HoldBinaryShader(BinaryShaderKey key)
+{
+    AutoCriticalSection lock(m_lock);
+    return m_initialized ? FindOrLoad(key) : nullptr;
+}
+
+std::shared_ptr<const ShaderProgramCache::BinaryShader>
+ShaderProgramCache::FindOrLoad(BinaryShaderKey key)
+{
+    const auto known = m_binaries.find(key);
+    if (known != m_binaries.end())
+        return known->second;
+    std::shared_ptr<const BinaryShader> loaded(LoadFromFile(key));
+    if (loaded)
+        m_binaries.emplace(key, loaded);
+    return loaded;
+}
+
+bool ShaderProgramCache::IsCurrent(const BinaryShader* record)
+{
+    AutoCriticalSection lock(m_lock);
+    const auto known = m_binaries.find(record->key);
+    return known != m_binaries.end() && known->second.get() == record;
+}
+
+bool ShaderProgramCache::SetBinaryShader(const BinaryShader& shader)
+{
+    NIB_FUNCTION("bool Nib::ShaderProgramCache::SetBinaryShader(const "
+                 "ShaderProgramCache::BinaryShader &)");
+    AutoCriticalSection lock(m_lock);
+    const BinaryShaderKey key = shader.key;
+    const bool replaces = m_binaries.count(key) != 0;
+    if (replaces)
+    {
+        NIB_LOG_WARN("%s - Binary shader already in cache. Replace with new version", function);
+        File::Unlink(GetFileName(key).c_str());
+    }
+    // Cloned before the old record goes: it may be the argument.
+    const std::shared_ptr<const BinaryShader> clone(shader.Clone());
+    m_binaries[key] = clone;
+    if (SaveToFile(clone.get()))
+        return true;
+    if (replaces)
+        NIB_LOG_ERROR("%s - Failed to save binary shader", function);
+    else
+        NIB_LOG_ERROR("%s - Failed to save cloned binary shader", function);
+    return false;
+}
+
+// ---- files --------------------------------------------------------------------------------------
+
+std::string ShaderProgramCache::GetFileName(BinaryShaderKey key) const
+{
+    char name[128];
+    std::snprintf(name, sizeof name, "/sh%0lu.dat", static_cast<unsigned long>(key));
+    return m_cacheDirectory + name;
+}
+
+bool ShaderProgramCache::SaveToFile(const BinaryShader* shader)
+{
+    NIB_FUNCTION("bool Nib::ShaderProgramCache::SaveToFile(const "
+                 "ShaderProgramCache::BinaryShader *)");
+    const std::string path = GetFileName(shader->key);
+    const std::string temporary = TemporaryName(path); // so that no reader sees half a file
+    String temporaryPath;
+    temporaryPath.Construct(temporary.c_str());
+    File file;
+    if (!file.Construct(&temporaryPath, "wbx", false))
+    {
+        NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
+                      path.c_str());
+        return false;
+    }
+    const bool isWritten = WriteBinaryShader(file, *shader);
+    const bool isClosed = file.Close() == 0;
+    if (!isWritten || !isClosed)
+    {
+        NIB_LOG_ERROR("%s filed to save file %s", function, path.c_str());
+        File::Unlink(&temporaryPath);
+        File::Unlink(path.c_str()); // what stands there is out of date
+        return false;
+    }
+    if (std::rename(temporary.c_str(), path.c_str()) != 0)
+    {
+        NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
+                      path.c_str());
+        File::Unlink(&temporaryPath);
+        return false;
+    }
+    return true;
+}
+
+ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderKey key)
+{
+    NIB_FUNCTION("ShaderProgramCache::BinaryShader *Nib::ShaderProgramCache::LoadFromFile("
+                 "ShaderProgramCache::BinaryShaderKey)");
+    const std::string name = GetFileName(key);
+    const char* const path = name.c_str();
+    String filePath;
+    filePath.Construct(path);
+    File file;
+    if (!file.Construct(&filePath, "rb", false))
+    {
+        NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
+                      path);
+        return nullptr;
+    }
+    errno = 0; // a file that is merely too short sets none
+
+    BinaryShaderHeader header;
+    if (file.Read(&header, 1, sizeof header) != sizeof header ||
+        header.magic != kBinaryShaderMagic || header.programLength == 0)
+    {
+        NIB_LOG_ERROR("%s File header read error Err=%d, File = %s", function, errno, path);
+        return nullptr;
+    }
+    if (header.programLength > kLongestProgram || header.attributeSize > kLargestAttributes)
+    {
+        NIB_LOG_ERROR("%s Program size (%lu) OR Attribute size (%lu) is too big to allocate "
+                      "memory. File = %s",
+                      function, static_cast<unsigned long>(header.programLength),
+                      static_cast<unsigned long>(header.attributeSize), path);
+        return nullptr;
+    }
+    auto shader = std::make_unique<BinaryShader>();
+    const auto length = static_cast<std::size_t>(header.programLength);
+    shader->bytes = new unsigned char[length];
+    if (file.Read(shader->bytes, 1, length) != length)
+    {
+        NIB_LOG_ERROR("%s File shader bin read error Err=%d, File = %s", function, errno, path);
+        return nullptr;
+    }
+    std::uint64_t crc = ContinueCrc(0, &header, sizeof header);
+    crc = ContinueCrc(crc, shader->bytes, length);
+
+    if (header.attributeSize != 0)
+    {
+        std::vector<unsigned char> block(static_cast<std::size_t>(header.attributeSize));
+        if (file.Read(block.data(), 1, block.size()) != block.size())
+        {
+            NIB_LOG_ERROR("%s File attribs read error Err=%d, File = %s", function, errno, path);
+            return nullptr;
+        }
+        crc = ContinueCrc(crc, block.data(), block.size());
+        const bool isParsed = ParseShaderAttributes(
+            block.data(), static_cast<unsigned int>(block.size()), shader->attributes);
+        if (!isParsed || shader->attributes.size() != header.attributeCount)
+        {
+            NIB_LOG_ERROR("%s Filed to parse shader attributes. Expected=%d. Found = %d", function,
+                          static_cast<int>(header.attributeCount),
+                          static_cast<int>(shader->attributes.size()));
+            return nullptr;
+        }
+    }
+    std::uint64_t storedCrc = 0;
+    if (file.Read(&storedCrc, sizeof storedCrc, 1) != 1)
+    {
+        NIB_LOG_ERROR("%s Filed to read CRC from file. Err=%d, File = %s", function, errno, path);
+        return nullptr;
+    }
+    if (storedCrc != crc)
+    {
+        NIB_LOG_ERROR("%s Invalid CRC, From file: %lu, Calculated: = %lu", function,
+                      static_cast<unsigned long>(storedCrc), static_cast<unsigned long>(crc));
+        return nullptr;
+    }
+    shader->key = key;
+    shader->length = static_cast<std::int32_t>(header.programLength);
+    shader->format = static_cast<std::uint32_t>(header.format);
+    return shader.release();
+}
+
+bool ShaderProgramCache::ParseShaderAttributes(const unsigned char* data, unsigned int size,
+                                               std::vector<std::string>& out)
+{
+    const unsigned char* const end = data + size;
+    while (data != end)
+    {
+        const unsigned char* const nul = std::find(data, end, '\0');
+        if (nul == end)
+            return false;
+        out.emplace_back(data, nul);
+        data = nul + 1;
+    }
+    return true;
+}
+
+} // namespace Nib
