@@ -38,9 +38,8 @@ bool TraceFormat::Has(std::string_view name) const
 TraceFormat TraceFormat::Plain()
 {
     TraceFormat format;
-    format.channels.resize(2);
-    format.channels[0].name = "X";
-    format.channels[1].name = "Y";
+    for (const char* name : {"X", "Y"})
+        format.channels.emplace_back().name.append(name);
     return format;
 }
 
