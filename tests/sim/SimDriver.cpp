@@ -53,7 +53,6 @@ SimDriver::~SimDriver()
         state->actions.clear();
         state->failures.clear();
         state->pace = SimPace::Instant;
-        ++state->gpuReleases;
         offences.swap(state->offences);
         expected.swap(state->expectedMisuse);
         misuses = state->misuses;

@@ -187,6 +187,7 @@ struct ShareGroup
     NameTable<Renderbuffer> renderbuffers;
     NameTable<Program> programs; // the two kinds have one name space
     NameTable<Shader> shaders;
+    GLuint lastProgramName = 0; // of either kind
     std::map<GLsync, Sync> syncs;
 };
 
@@ -252,6 +253,7 @@ struct GlState
 
     int activeUnit = 0;
     std::array<std::map<GLenum, GLuint>, kTextureUnits> textures; // by unit, then target
+    std::map<GLenum, Texture> defaultTextures;                    // those of name 0, by target
     std::array<GLuint, kTextureUnits> samplers{};
     std::map<GLenum, GLuint> buffers; // all targets but GL_ELEMENT_ARRAY_BUFFER
     std::map<GLuint, BufferRange> uniformBuffers;
@@ -264,6 +266,7 @@ struct GlState
     std::array<std::array<double, 4>, kVertexAttribs> currentAttribs;
     GLuint program = 0;
     GLuint transformFeedback = 0;
+    bool feedbackActive = false;
     GLenum defaultReadBuffer = GL_BACK;
     std::vector<GLenum> defaultDrawBuffers{GL_BACK};
     bool tiling = false; // between glStartTilingQCOM and glEndTilingQCOM

@@ -123,7 +123,6 @@ struct StateData
     std::set<std::string> held;
     std::map<std::string, int> blocked; // threads in a held call
     SimPace pace = SimPace::Instant;
-    int gpuReleases = 0;
 
     std::vector<std::string> misuses;
     std::vector<std::pair<std::string, std::string>> offences; // those not allowed: function, text
