@@ -5,6 +5,7 @@
 #include <CLI/CLI.hpp>
 
 #include <cstdio>
+#include <cstdlib>
 #include <exception>
 
 namespace
@@ -22,6 +23,8 @@ int Fail(const std::exception& failure)
 
 int main(int argc, char** argv)
 {
+    // The library's own log lines are for its developers; NIB_LOG brings them back.
+    setenv("NIB_LOG", "silent", 0);
     CLI::App app("Draw with NibRenderer from the command line", "nib");
     app.set_version_flag("--version", std::string("nib ") + NIB_VERSION);
     app.require_subcommand(1);
