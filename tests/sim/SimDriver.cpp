@@ -3,6 +3,7 @@
 #include "SimState.h"
 
 #include <gtest/gtest.h>
+#include <nib/base.h>
 
 #include <algorithm>
 #include <ostream>
@@ -32,6 +33,7 @@ std::ostream& operator<<(std::ostream& out, const SimLogLine& line)
 
 SimDriver::SimDriver(SimGpu gpu)
 {
+    Nib::System::SetDesktopFallbacks(false); // a device is played, to the bit
     ForgetLog();
     PrintLog(false);
     Locked state;
