@@ -41,8 +41,9 @@ void RestoreObjects(Observer<IManagedObject>& observer);
 namespace ContextHandshake
 {
 
-/// The parent's context. Written by the parent before it resumes the worker, read by the child in
-/// tasks that run after the resume; atomic, since a second hand-shake may follow the first.
+/// The parent's context. Written by the parent before it resumes the worker, read and emptied by
+/// the child in tasks that run after the resume; atomic, since a second hand-shake may follow the
+/// first.
 using Cell = std::shared_ptr<std::atomic<EGLContext>>;
 
 /// The task shares the worker, since a child may be deleted while its parent still holds the task.

@@ -92,16 +92,17 @@ void RenderThreadFBRImpl::GetContextAndResume(ContextHandshake::Worker worker,
     ContextHandshake::HandOver(*worker, *cell, function);
 }
 
-EGLContext RenderThreadFBRImpl::ParentContext() const
+EGLContext RenderThreadFBRImpl::TakeParentContext()
 {
-    return m_parentContext->load(std::memory_order_acquire); // after the parent's release
+    // Once: by the next resume the parent may have another. Acquires what the parent released.
+    return m_parentContext->exchange(EGL_NO_CONTEXT, std::memory_order_acquire);
 }
 
 bool RenderThreadFBRImpl::Init()
 {
     NIB_FUNCTION("bool Nib::GLES::RenderThreadFBRImpl::Init()");
     NIB_LOG_INFO("%s", function);
-    if (!m_context.Create(ParentContext(), kFrontBuffer, EglContext::Priority::High) ||
+    if (!m_context.Create(TakeParentContext(), kFrontBuffer, EglContext::Priority::High) ||
         !m_surface.Create())
     {
         NIB_LOG_ERROR("%s Failed to create context", function);
@@ -182,7 +183,7 @@ void RenderThreadFBRImpl::DoResume()
 {
     NIB_FUNCTION("void Nib::GLES::RenderThreadFBRImpl::DoResume()");
     NIB_LOG_INFO("%s", function);
-    if (!m_context.Create(ParentContext(), kFrontBuffer, EglContext::Priority::High))
+    if (!m_context.Create(TakeParentContext(), kFrontBuffer, EglContext::Priority::High))
     {
         NIB_LOG_ERROR("%s Failed to create context", function);
         return;

@@ -75,7 +75,7 @@ private:
     void DoPause();
     void DoResume();
     void DoTerminate();
-    EGLContext ParentContext() const;
+    EGLContext TakeParentContext();
 
     IGLMsgQueue* m_parent; // the caller's, may be null
     Observer<IManagedObject> m_observer;

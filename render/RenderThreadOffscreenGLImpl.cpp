@@ -80,9 +80,10 @@ void RenderThreadOffscreenGLImpl::GetContextAndResume(ContextHandshake::Worker w
     ContextHandshake::HandOver(*worker, *cell, function);
 }
 
-EGLContext RenderThreadOffscreenGLImpl::ParentContext() const
+EGLContext RenderThreadOffscreenGLImpl::TakeParentContext()
 {
-    return m_parentContext->load(std::memory_order_acquire); // after the parent's release
+    // Once: by the next resume the parent may have another. Acquires what the parent released.
+    return m_parentContext->exchange(EGL_NO_CONTEXT, std::memory_order_acquire);
 }
 
 EglContext::Priority RenderThreadOffscreenGLImpl::GetPrefferedContextPriority()
@@ -101,7 +102,7 @@ bool RenderThreadOffscreenGLImpl::Init()
 {
     NIB_FUNCTION("bool Nib::GLES::RenderThreadOffscreenGLImpl::Init()");
     NIB_LOG_INFO("%s", function);
-    if (!m_context.Create(ParentContext(), !kFrontBuffer, GetPrefferedContextPriority()))
+    if (!m_context.Create(TakeParentContext(), !kFrontBuffer, GetPrefferedContextPriority()))
     {
         NIB_LOG_ERROR("%s Failed to create context", function);
         return false;
@@ -189,7 +190,7 @@ void RenderThreadOffscreenGLImpl::DoResume()
     NIB_FUNCTION("void Nib::GLES::RenderThreadOffscreenGLImpl::DoResume()");
     NIB_LOG_INFO("%s", function);
     // On the front-buffer configuration, unlike the first context: the exported behaviour.
-    if (!m_context.Create(ParentContext(), kFrontBuffer, GetPrefferedContextPriority()))
+    if (!m_context.Create(TakeParentContext(), kFrontBuffer, GetPrefferedContextPriority()))
     {
         NIB_LOG_ERROR("%s Failed to create context", function);
         return;

@@ -67,7 +67,7 @@ private:
     void DoResume();
     void DoRender();
     void DoTerminate();
-    EGLContext ParentContext() const;
+    EGLContext TakeParentContext();
 
     IGLMsgQueue* m_parent; // the caller's, may be null
     Observer<IManagedObject> m_observer;

@@ -64,7 +64,8 @@ public:
     virtual int GetType() = 0;
 
     /// [blocks] True: the thread runs. Not: it has a context; a failed start-up is only logged.
-    /// When the thread cannot be started it blocks for ever, except with a parent.
+    /// When the thread cannot be started it blocks for ever, except with a parent. Tasks that were
+    /// posted before it may run without a context.
     virtual bool Start() = 0;
 
     /// [blocks] A window has come or changed its size. @p window is an ANativeWindow, borrowed
