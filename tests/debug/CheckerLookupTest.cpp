@@ -105,14 +105,28 @@ TEST_F(ResourceCheckerTest, RemoveOfAnUnknownNameThrows)
     }
 }
 
+namespace
+{
+
+/// Details that tell when they are freed.
+struct Watched : ResourceChecker::BaseInfo
+{
+    explicit Watched(bool& flag) : gone(flag) {}
+    ~Watched() override { gone = true; }
+    bool& gone;
+};
+
+} // namespace
+
+TEST_F(ResourceCheckerTest, AddOfNameZeroFreesTheDetails)
+{
+    bool gone = false;
+    ResourceChecker::addLookup(0, Texture, std::make_unique<Watched>(gone));
+    EXPECT_TRUE(gone);
+}
+
 TEST_F(ResourceCheckerTest, RemoveFreesTheDetails)
 {
-    struct Watched : ResourceChecker::BaseInfo
-    {
-        explicit Watched(bool& flag) : gone(flag) {}
-        ~Watched() override { gone = true; }
-        bool& gone;
-    };
     bool gone = false;
     ResourceChecker::addLookup(5, Texture, std::make_unique<Watched>(gone));
     EXPECT_FALSE(gone);

@@ -453,6 +453,8 @@ TEST_P(EveryDevice, HasItsVerdicts)
     SimDriver driver(SimGpu::Named(GetParam().renderer).WithFrontBuffer());
 
     EXPECT_EQ(Nib::IsCompatibleGL(), GetParam().compatible);
+    EXPECT_EQ(driver.CountLog(ANDROID_LOG_ERROR, kExtensionsMissing),
+              GetParam().compatible ? 0u : 1u);
     EXPECT_EQ(Nib::IsFBRSupported(), GetParam().frontBuffer);
 }
 

@@ -55,6 +55,19 @@ TEST(Tiling, IsNotSupportedWhereTheEntryPointsAreMissing)
     EXPECT_FALSE(OpenGLRenderer::startTilingQCOM(1, 2, 3, 4, 1));
 }
 
+TEST(Tiling, StopDoesNothingWhereItsEntryPointAloneIsMissing)
+{
+    Device device(TiledPhone());
+    device.driver.FailAt(5, EGL_SUCCESS); // three texts, glStartTilingQCOM, glEndTilingQCOM
+    InitOpenGLExtensions();
+    device.driver.ForgetCalls();
+
+    EXPECT_TRUE(OpenGLRenderer::startTilingQCOM(1, 2, 3, 4, 0));
+    OpenGLRenderer::stopTilingQCOM(1);
+
+    EXPECT_EQ(device.driver.CallNames(), Names({"glStartTilingQCOM"}));
+}
+
 TEST(Tiling, EntryPointsAreResolvedByName)
 {
     Device device(TiledPhone());
