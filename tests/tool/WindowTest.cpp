@@ -137,4 +137,18 @@ TEST(Window, ClosesWhenItsUserAsks)
     EXPECT_EQ(result.err, "");
 }
 
+TEST(FrontBuffer, SaysWhyNotAndDrawsFrames)
+{
+    Screen screen;
+    if (!screen.IsThere())
+        GTEST_SKIP() << "no X server: DISPLAY is unset or does not answer";
+    TemporaryFolder folder;
+    const NibResult result = RunNib({"draw", NIB_SAMPLE, "--window", "--speed", "max",
+                                     "--front-buffer", "-o", folder.Path("page.png")});
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.err, "nib: --front-buffer: the display has no EGL_KHR_mutable_render_buffer; "
+                          "drawing frames instead\n");
+    EXPECT_NE(result.out.find("433 frames"), std::string::npos);
+}
+
 } // namespace
