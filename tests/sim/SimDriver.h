@@ -127,7 +127,7 @@ public:
     /// Calls of @p name block from now on, until Release(@p name) or the end of the driver.
     void Hold(const char* name);
     void Release(const char* name);
-    /// Waits until a thread is blocked in a held call of @p name.
+    /// Waits until a thread is blocked in a call of @p name, held or waiting for the GPU.
     void WaitUntilHeld(const char* name);
 
     void SetPace(SimPace pace);

@@ -45,10 +45,15 @@ void Entry::WaitWhileHeld()
 {
     if (state.held.empty() || !state.held.count(m_name))
         return;
-    ++state.blocked[m_name];
-    state.changed.notify_all();
+    NoteBlocked(1);
     state.changed.wait(m_lock, [this] { return !state.held.count(m_name); });
-    --state.blocked[m_name];
+    NoteBlocked(-1);
+}
+
+void Entry::NoteBlocked(int change)
+{
+    state.blocked[m_name] += change;
+    state.changed.notify_all();
 }
 
 void Entry::Record(std::initializer_list<SimValue> args)

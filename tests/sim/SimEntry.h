@@ -39,7 +39,11 @@ public:
     void Wait(Done done)
     {
         m_record = nullptr; // it may move, or be forgotten, meanwhile
+        if (done())
+            return;
+        NoteBlocked(1);
         state.changed.wait(m_lock, done);
+        NoteBlocked(-1);
     }
 
 protected:
@@ -59,6 +63,8 @@ protected:
     unsigned m_error = 0;
 
 private:
+    /// What SimDriver::WaitUntilHeld waits for.
+    void NoteBlocked(int change);
     void RunAction();
     void WaitWhileHeld();
     bool TakeFailure(Api api, std::initializer_list<SimValue> args);

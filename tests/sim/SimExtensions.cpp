@@ -67,6 +67,9 @@ SIM_API Function eglGetProcAddress(const char* name)
     return present ? row->function : nullptr;
 }
 
+// A frame may have several dirty rectangles, each of which starts a region, and every frame ends
+// one, started or not: out of order the calls are errors without blame.
+
 void Sim::Extension::glStartTilingQCOM(GLuint x, GLuint y, GLuint width, GLuint height,
                                        GLbitfield preserveMask)
 {
@@ -74,7 +77,7 @@ void Sim::Extension::glStartTilingQCOM(GLuint x, GLuint y, GLuint width, GLuint 
     if (!entry)
         return;
     if (entry.Gl().tiling)
-        return entry.Misuse(GL_INVALID_OPERATION, "tiling was started already");
+        return entry.Refuse(GL_INVALID_OPERATION);
     entry.Gl().tiling = true;
 }
 
@@ -83,7 +86,6 @@ void Sim::Extension::glEndTilingQCOM(GLbitfield preserveMask)
     GlEntry entry("glEndTilingQCOM", {preserveMask});
     if (!entry)
         return;
-    // Without a started region the call is an error, but each frame ends with it: no blame.
     if (!entry.Gl().tiling)
         return entry.Refuse(GL_INVALID_OPERATION);
     entry.Gl().tiling = false;

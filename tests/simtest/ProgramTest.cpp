@@ -123,4 +123,128 @@ TEST(SimProgram, UniformsKeepTheirValues)
     EXPECT_EQ(driver.Program(program).uniforms[1].values, (std::vector<double>{0, 0, 0, 2}));
 }
 
+TEST(SimProgram, BlocksAndTheirMembers)
+{
+    SimDriver driver;
+    const SimContext context(driver);
+    const GLuint vertex =
+        Compile(GL_VERTEX_SHADER, "#version 300 es\n"
+                                  "layout(location = 3) in vec2 a_pos;\n"
+                                  "layout(std140) uniform Frame { mat4 m; vec2 size; };\n"
+                                  "uniform Light { vec4 color; } u_light;\n"
+                                  "void main() { gl_Position = m * vec4(a_pos, 0, 1); }\n");
+    const GLuint fragment =
+        Compile(GL_FRAGMENT_SHADER, "#version 300 es\nout vec4 color;\nvoid main() {}\n");
+    const GLuint program = glCreateProgram();
+    glAttachShader(program, vertex);
+    glAttachShader(program, fragment);
+    glLinkProgram(program);
+    ASSERT_EQ(LinkStatus(program), 1);
+
+    EXPECT_EQ(glGetUniformBlockIndex(program, "Frame"), 0u);
+    EXPECT_EQ(glGetUniformBlockIndex(program, "Light"), 1u);
+    EXPECT_EQ(glGetUniformBlockIndex(program, "None"), GL_INVALID_INDEX);
+    EXPECT_EQ(glGetUniformLocation(program, "m"), -1);
+    EXPECT_EQ(glGetAttribLocation(program, "a_pos"), 3);
+    GLint size = 0;
+    glGetActiveUniformBlockiv(program, 0, GL_UNIFORM_BLOCK_DATA_SIZE, &size);
+    EXPECT_EQ(size, 80);
+    glUniformBlockBinding(program, 1, 2);
+    EXPECT_EQ(driver.Program(program).blocks[1].binding, 2u);
+    EXPECT_EQ(driver.Program(program).uniforms[2].name, "Light.color");
+}
+
+TEST(SimProgram, ActiveNamesAreCut)
+{
+    SimDriver driver;
+    const SimContext context(driver);
+    const GLuint program = Build();
+    char name[5] = "";
+    GLsizei length = 0;
+    GLint size = 0;
+    GLenum type = 0;
+    glGetActiveUniform(program, 0, sizeof name, &length, &size, &type, name);
+    EXPECT_STREQ(name, "u_ma");
+    EXPECT_EQ(length, 4);
+    EXPECT_EQ(type, GLenum{GL_FLOAT_MAT4});
+}
+
+TEST(SimProgram, UnboundAttributesDoNotFollowTheSource)
+{
+    SimDriver driver;
+    const SimContext context(driver);
+    const GLuint vertex =
+        Compile(GL_VERTEX_SHADER, "attribute vec2 z;\nattribute vec2 a;\nvoid main() {}\n");
+    const GLuint fragment = Compile(GL_FRAGMENT_SHADER, "void main() {}\n");
+    const GLuint program = glCreateProgram();
+    glAttachShader(program, vertex);
+    glAttachShader(program, fragment);
+    glLinkProgram(program);
+    EXPECT_EQ(driver.Program(program).attributes, (std::map<std::string, int>{{"a", 0}, {"z", 1}}));
+}
+
+TEST(SimProgram, FailuresMayBeInjected)
+{
+    SimDriver driver;
+    const SimContext context(driver);
+    driver.FailCompile("vertex log");
+    const GLuint shader = Compile(GL_VERTEX_SHADER, kVertex);
+    EXPECT_EQ(ShaderStatus(shader), 0);
+    glCompileShader(shader);
+    EXPECT_EQ(ShaderStatus(shader), 1);
+    driver.FailLink("link log");
+    const GLuint program = Build();
+    EXPECT_EQ(LinkStatus(program), 0);
+    char log[32] = "";
+    glGetProgramInfoLog(program, sizeof log, nullptr, log);
+    EXPECT_STREQ(log, "link log");
+}
+
+TEST(SimProgram, BinariesNeedAFormat)
+{
+    SimDriver driver(SimGpu::Default().WithoutProgramBinaries());
+    const SimContext context(driver);
+    const GLuint program = Build();
+    GLint length = 5;
+    glGetProgramiv(program, GL_PROGRAM_BINARY_LENGTH, &length);
+    EXPECT_EQ(length, 0);
+    GLenum format = 0;
+    glGetProgramBinary(program, 0, nullptr, &format, nullptr);
+    EXPECT_EQ(glGetError(), GLenum{GL_INVALID_OPERATION});
+}
+
+TEST(SimProgram, AUniformOfAnotherTypeIsMisuse)
+{
+    SimDriver driver;
+    driver.ExpectMisuse("glUniform1f");
+    const SimContext context(driver);
+    const GLuint program = Build();
+    glUseProgram(program);
+    glUniform1f(glGetUniformLocation(program, "u_size"), 1);
+    EXPECT_EQ(glGetError(), GLenum{GL_INVALID_OPERATION});
+    glUniform1f(-1, 1);
+    EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
+}
+
+TEST(SimProgram, ADeletedProgramLivesWhileItIsUsed)
+{
+    SimDriver driver;
+    const SimContext context(driver);
+    const GLuint program = Build();
+    glUseProgram(program);
+    glDeleteProgram(program);
+    EXPECT_EQ(driver.Live().programs, 1);
+    glUseProgram(0);
+    EXPECT_EQ(driver.Live().programs, 0);
+}
+
+TEST(SimProgram, AnUnknownProgramIsMisuse)
+{
+    SimDriver driver;
+    driver.ExpectMisuse("glDeleteProgram");
+    const SimContext context(driver);
+    glDeleteProgram(0xFFFFFFFF);
+    EXPECT_EQ(glGetError(), GLenum{GL_INVALID_VALUE});
+}
+
 } // namespace
