@@ -18,6 +18,8 @@ int ConfigIndex(EGLConfig handle, const SimGpu& gpu);
 /// Takes a context that is destroyed and current nowhere out of the state.
 void BuryContext(State& state, Context& context);
 void BurySurface(State& state, Surface& surface);
+/// Nothing is current on the thread afterwards.
+void ReleaseCurrent(State& state, Thread& thread);
 void DestroyAllContexts(State& state);
 void DestroyAllSurfaces(State& state);
 

@@ -80,29 +80,6 @@ bool SameColors(const SimConfig& a, const SimConfig& b)
     return a.red == b.red && a.green == b.green && a.blue == b.blue && a.alpha == b.alpha;
 }
 
-void Detach(State& state, Thread& thread)
-{
-    Context* const context = std::exchange(thread.context, nullptr);
-    Surface* const draw = std::exchange(thread.draw, nullptr);
-    Surface* const read = std::exchange(thread.read, nullptr);
-    if (context)
-    {
-        FlushContext(*context);
-        context->thread = 0;
-        BuryContext(state, *context);
-    }
-    if (read && read != draw)
-    {
-        read->thread = 0;
-        BurySurface(state, *read);
-    }
-    if (draw)
-    {
-        draw->thread = 0;
-        BurySurface(state, *draw);
-    }
-}
-
 /// A surface that may become current on @p thread together with @p context; null with the error
 /// set.
 Surface* UsableSurface(EglEntry& entry, EGLSurface handle, const Context& context)
@@ -138,6 +115,29 @@ void BuryContext(State& state, Context& context)
         return;
     CountLost(state.lost, context);
     state.contexts.erase(context.handle);
+}
+
+void ReleaseCurrent(State& state, Thread& thread)
+{
+    Context* const context = std::exchange(thread.context, nullptr);
+    Surface* const draw = std::exchange(thread.draw, nullptr);
+    Surface* const read = std::exchange(thread.read, nullptr);
+    if (context)
+    {
+        FlushContext(*context);
+        context->thread = 0;
+        BuryContext(state, *context);
+    }
+    if (read && read != draw)
+    {
+        read->thread = 0;
+        BurySurface(state, *read);
+    }
+    if (draw)
+    {
+        draw->thread = 0;
+        BurySurface(state, *draw);
+    }
 }
 
 void DestroyAllContexts(State& state)
@@ -226,7 +226,7 @@ SIM_API EGLBoolean eglMakeCurrent(EGLDisplay display, EGLSurface draw, EGLSurfac
     {
         if (draw != EGL_NO_SURFACE || read != EGL_NO_SURFACE)
             return entry.Refuse(EGL_BAD_MATCH);
-        Detach(entry.state, thread);
+        ReleaseCurrent(entry.state, thread);
         return EGL_TRUE;
     }
     Context* const context = entry.CheckContext(handle);
@@ -250,7 +250,7 @@ SIM_API EGLBoolean eglMakeCurrent(EGLDisplay display, EGLSurface draw, EGLSurfac
     }
     if (thread.context == context && thread.draw == drawSurface && thread.read == readSurface)
         return EGL_TRUE;
-    Detach(entry.state, thread);
+    ReleaseCurrent(entry.state, thread);
     thread.context = context;
     thread.draw = drawSurface;
     thread.read = readSurface;
@@ -269,7 +269,7 @@ SIM_API EGLBoolean eglReleaseThread()
     EglEntry entry("eglReleaseThread", {});
     if (!entry)
         return EGL_FALSE;
-    Detach(entry.state, entry.CallingThread());
+    ReleaseCurrent(entry.state, entry.CallingThread());
     entry.CallingThread().api.reset();
     return EGL_TRUE;
 }

@@ -1,4 +1,4 @@
-#include "SimState.h"
+#include "SimEgl.h"
 
 #include <atomic>
 
@@ -20,13 +20,7 @@ struct ThreadEnd
         const auto found = state.threads.find(number);
         if (found == state.threads.end())
             return;
-        if (found->second.context)
-            found->second.context->thread = 0;
-        for (Surface* surface : {found->second.draw, found->second.read})
-        {
-            if (surface)
-                surface->thread = 0;
-        }
+        ReleaseCurrent(state, found->second);
         state.threads.erase(found);
     }
 };

@@ -144,6 +144,22 @@ TEST(SimEgl, AThreadThatEndsReleasesItsContext)
     EXPECT_EQ(driver.Live().contexts, 0);
 }
 
+TEST(SimEgl, ADestroyedContextDiesWithItsThread)
+{
+    SimDriver driver;
+    const EGLDisplay display = Display();
+    const EGLContext context = NewContext(display);
+    std::thread(
+        [&]
+        {
+            eglMakeCurrent(display, EGL_NO_SURFACE, EGL_NO_SURFACE, context);
+            eglDestroyContext(display, context);
+        })
+        .join();
+
+    EXPECT_EQ(driver.Live().contexts, 0);
+}
+
 TEST(SimEgl, ObjectsBelongToTheShareGroup)
 {
     SimDriver driver;
