@@ -1,11 +1,9 @@
+#include "DriverContext.h"
+
 #include <nib/device.h>
 
-#include <EGL/egl.h>
-#include <GLES3/gl31.h>
-
-#include <gtest/gtest.h>
-
 #include <array>
+#include <cstdint>
 #include <vector>
 
 // Store and restore of the state, entry by entry, on whatever driver the process has loaded.
@@ -15,59 +13,13 @@ using Nib::OpenGLRenderer;
 namespace
 {
 
-/// A context of the driver, current on a small pbuffer, as somebody else's context that the library
-/// draws in.
-class OpenGlStateOnDriver : public testing::Test
+class OpenGlStateOnDriver : public DriverContext
 {
 protected:
     void SetUp() override
     {
-        m_display = eglGetDisplay(EGL_DEFAULT_DISPLAY);
-        ASSERT_EQ(eglInitialize(m_display, nullptr, nullptr), EGLBoolean{EGL_TRUE});
-        eglBindAPI(EGL_OPENGL_ES_API);
-        const EGLint wanted[] = {EGL_SURFACE_TYPE,
-                                 EGL_PBUFFER_BIT,
-                                 EGL_RENDERABLE_TYPE,
-                                 EGL_OPENGL_ES3_BIT,
-                                 EGL_RED_SIZE,
-                                 8,
-                                 EGL_ALPHA_SIZE,
-                                 8,
-                                 EGL_NONE};
-        EGLConfig config = nullptr;
-        EGLint count = 0;
-        ASSERT_EQ(eglChooseConfig(m_display, wanted, &config, 1, &count), EGLBoolean{EGL_TRUE});
-        ASSERT_EQ(count, 1);
-        const EGLint version[] = {EGL_CONTEXT_CLIENT_VERSION, 3, EGL_NONE};
-        m_context = eglCreateContext(m_display, config, EGL_NO_CONTEXT, version);
-        ASSERT_NE(m_context, EGL_NO_CONTEXT);
-        const EGLint size[] = {EGL_WIDTH, 64, EGL_HEIGHT, 32, EGL_NONE};
-        m_surface = eglCreatePbufferSurface(m_display, config, size);
-        ASSERT_NE(m_surface, EGL_NO_SURFACE);
-        ASSERT_EQ(eglMakeCurrent(m_display, m_surface, m_surface, m_context), EGLBoolean{EGL_TRUE});
+        DriverContext::SetUp();
         m_samplers = OpenGLRenderer::getSupportSampler();
-    }
-
-    void TearDown() override
-    {
-        EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
-        eglMakeCurrent(m_display, EGL_NO_SURFACE, EGL_NO_SURFACE, EGL_NO_CONTEXT);
-        eglDestroySurface(m_display, m_surface);
-        eglDestroyContext(m_display, m_context);
-    }
-
-    static GLint Integer(GLenum name)
-    {
-        GLint value = -1;
-        glGetIntegerv(name, &value);
-        return value;
-    }
-
-    static std::array<GLint, 4> FourIntegers(GLenum name)
-    {
-        std::array<GLint, 4> values = {-1, -1, -1, -1};
-        glGetIntegerv(name, values.data());
-        return values;
     }
 
     static GLint Attribute(GLuint index, GLenum name)
@@ -125,11 +77,6 @@ protected:
 
     OpenGLRenderer::OpenGlState m_state;
     bool m_samplers = false;
-
-private:
-    EGLDisplay m_display = EGL_NO_DISPLAY;
-    EGLContext m_context = EGL_NO_CONTEXT;
-    EGLSurface m_surface = EGL_NO_SURFACE;
 };
 
 } // namespace
