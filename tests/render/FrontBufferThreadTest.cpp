@@ -159,6 +159,7 @@ TEST(RenderThreadFBR, StartFailsWithoutAThreadAndDoesNotBlock)
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = NewThread(parent->GetMsgQueue());
     const NoMoreThreads noMore;
+    const LeaksAllowed itsStartTask;
 
     EXPECT_FALSE(thread->Start());
 }

@@ -249,6 +249,7 @@ TEST(RenderThreadOffscreenGL, StartFailsWithoutAThreadAndDoesNotBlock)
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = NewThread(parent->GetMsgQueue());
     const NoMoreThreads noMore;
+    const LeaksAllowed itsStartTask;
 
     EXPECT_FALSE(thread->Start());
 
@@ -501,7 +502,6 @@ TEST(RenderThreadOffscreenGLEnd, WithAnAnswerQueuedOnABusyParentWaitsForIt)
     SimDriver driver(Gpu());
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = NewThread(parent->GetMsgQueue());
-    std::atomic<bool> ended{false};
     {
         Gate busy(parent->GetMsgQueue());
         std::thread starter([&] { thread->Start(); });

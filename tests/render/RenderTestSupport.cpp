@@ -198,3 +198,19 @@ NoMoreThreads::~NoMoreThreads()
     pthread_setattr_default_np(&m_usual);
     pthread_attr_destroy(&m_usual);
 }
+
+// Weak: there only when the sanitizer is.
+extern "C" __attribute__((weak)) void __lsan_disable();
+extern "C" __attribute__((weak)) void __lsan_enable();
+
+LeaksAllowed::LeaksAllowed()
+{
+    if (__lsan_disable != nullptr)
+        __lsan_disable();
+}
+
+LeaksAllowed::~LeaksAllowed()
+{
+    if (__lsan_enable != nullptr)
+        __lsan_enable();
+}
