@@ -20,18 +20,22 @@ struct Request
     const void* indices = nullptr;
 };
 
-/// Attributes that would be read from memory at an address that can only be an offset.
+/// Attributes that the program reads from memory at an address that can only be an offset. Arrays
+/// that an earlier draw left enabled do no harm as long as the program does not use them.
 void CheckAttribs(GlEntry& entry, const VertexArray& array)
 {
     constexpr std::uintptr_t kLargestOffset = 1 << 16;
-    for (std::size_t i = 0; i < array.attribs.size(); ++i)
+    const Program* const program = entry.Group().programs.Find(entry.Gl().program);
+    if (!program)
+        return;
+    for (const Variable& used : program->executable.attributes)
     {
-        const SimVertexAttrib& attrib = array.attribs[i];
+        const SimVertexAttrib& attrib = array.attribs.at(static_cast<std::size_t>(used.location));
         const auto address = reinterpret_cast<std::uintptr_t>(attrib.pointer);
         if (attrib.enabled && attrib.buffer == 0 && address < kLargestOffset)
-            entry.Misuse("attribute " + std::to_string(i) + " is enabled, and has no buffer");
+            entry.Misuse("attribute '" + used.name + "' is enabled, and has no buffer");
         else if (attrib.enabled && attrib.buffer != 0 && !entry.Group().buffers.Find(attrib.buffer))
-            entry.Misuse("attribute " + std::to_string(i) + " has a deleted buffer");
+            entry.Misuse("attribute '" + used.name + "' has a deleted buffer");
     }
 }
 

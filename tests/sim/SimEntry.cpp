@@ -152,9 +152,16 @@ GlEntry::GlEntry(const char* name, std::initializer_list<SimValue> args, int ver
 
 void GlEntry::SetError(GLenum error)
 {
-    // One flag, as most drivers have it: an error that nobody has read keeps later ones out.
-    if (error != GL_NO_ERROR && Gl().errors.empty())
+    // One flag, as most drivers have it: an error that nobody has read keeps later ones out. An
+    // injected framebuffer status is no error.
+    const bool isError = error >= GL_INVALID_ENUM && error <= GL_INVALID_FRAMEBUFFER_OPERATION;
+    if (isError && Gl().errors.empty())
         Gl().errors.push_back(error);
+}
+
+bool GlEntry::HasContext() const
+{
+    return m_thread->context != nullptr;
 }
 
 void GlEntry::Refuse(GLenum error)

@@ -96,7 +96,8 @@ public:
     /// @p version is the first version of OpenGL ES that has the function: 20 or 30.
     GlEntry(const char* name, std::initializer_list<SimValue> args, int version = 20);
 
-    /// Only when the call was not refused.
+    bool HasContext() const;
+    /// Only with a context, which every call that was not refused has.
     Context& CurrentContext() { return *m_thread->context; }
     GlState& Gl() { return m_thread->context->gl; }
     ShareGroup& Group() { return *m_thread->context->group; }

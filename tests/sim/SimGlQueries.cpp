@@ -303,8 +303,8 @@ using namespace Sim;
 SIM_API GLenum glGetError()
 {
     GlEntry entry("glGetError", {});
-    if (!entry)
-        return entry.InjectedError();
+    if (!entry.HasContext())
+        return GL_NO_ERROR;
     std::deque<GLenum>& errors = entry.Gl().errors;
     if (errors.empty())
         return GL_NO_ERROR;

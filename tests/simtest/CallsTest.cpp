@@ -100,6 +100,15 @@ TEST(SimFailures, ByNumber)
     EXPECT_TRUE(driver.Calls()[1].failed);
 }
 
+TEST(SimFailures, AnErrorQueryThatFailsReportsItOnce)
+{
+    SimDriver driver;
+    const SimContext context(driver);
+    driver.FailNext("glGetError", GL_OUT_OF_MEMORY);
+    EXPECT_EQ(glGetError(), GLenum{GL_OUT_OF_MEMORY});
+    EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
+}
+
 TEST(SimFailures, QueuedErrorsComeOutInOrder)
 {
     SimDriver driver;

@@ -45,6 +45,7 @@ TEST(SimFramebuffer, TheStatusMayBeInjected)
     const SimContext context(driver);
     driver.FailNext("glCheckFramebufferStatus", GL_FRAMEBUFFER_UNSUPPORTED);
     EXPECT_EQ(glCheckFramebufferStatus(GL_FRAMEBUFFER), GLenum{GL_FRAMEBUFFER_UNSUPPORTED});
+    EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
     EXPECT_EQ(glCheckFramebufferStatus(GL_FRAMEBUFFER), GLenum{GL_FRAMEBUFFER_COMPLETE});
 }
 

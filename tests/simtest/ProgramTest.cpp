@@ -247,4 +247,21 @@ TEST(SimProgram, AnUnknownProgramIsMisuse)
     EXPECT_EQ(glGetError(), GLenum{GL_INVALID_VALUE});
 }
 
+TEST(SimProgram, AnAttributeWithoutABufferIsMisuse)
+{
+    SimDriver driver;
+    driver.ExpectMisuse("glDrawArrays");
+    const SimContext context(driver);
+    glUseProgram(Build());
+    glEnableVertexAttribArray(5); // no attribute of the program
+    glDrawArrays(GL_TRIANGLES, 0, 3);
+    EXPECT_TRUE(driver.Misuses().empty());
+    glEnableVertexAttribArray(1);
+    glDrawArrays(GL_TRIANGLES, 0, 3);
+
+    EXPECT_EQ(driver.Misuses(), std::vector<std::string>{"glDrawArrays: attribute 'a_color' is "
+                                                         "enabled, and has no buffer"});
+    EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
+}
+
 } // namespace

@@ -171,16 +171,6 @@ TEST(SimDraws, KeepTheirAttributes)
     EXPECT_EQ(draws[1].first, 1);
 }
 
-TEST(SimDraws, AnAttributeWithoutABufferIsMisuse)
-{
-    SimDriver driver;
-    driver.ExpectMisuse("glDrawArrays");
-    const SimContext context(driver);
-    glEnableVertexAttribArray(0);
-    glDrawArrays(GL_TRIANGLES, 0, 3);
-    EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
-}
-
 TEST(SimDraws, IndicesBehindTheBufferAreMisuse)
 {
     SimDriver driver;
