@@ -4,6 +4,7 @@
 #include "drivers/RenderThreadSupport.h"
 
 #include <nib/device.h>
+#include <nib/egl.h>
 #include <nib/render_thread.h>
 
 #include <EGL/egl.h>
@@ -68,6 +69,7 @@ class OffscreenThreadOnDriver : public testing::Test
 protected:
     void SetUp() override
     {
+        ASSERT_EQ(Egl::GetEglStatus(), 0) << "the driver does not start";
         parent.reset(GLES::CreateSurfaceRenderer("parent", RenderThreadGL::Medium));
         ASSERT_TRUE(parent->Start());
         child.reset(GLES::CreateOffscreenRenderer(parent->GetMsgQueue(), "child", true));
@@ -79,6 +81,8 @@ protected:
     {
         for (RenderThreadGL* thread : {parent.get(), child.get()})
         {
+            if (thread == nullptr)
+                continue;
             RunOn(thread->GetMsgQueue(),
                   []
                   {

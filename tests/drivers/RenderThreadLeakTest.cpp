@@ -3,6 +3,7 @@
 #include "drivers/RenderThreadSupport.h"
 #include "drivers/XWindow.h"
 
+#include <nib/egl.h>
 #include <nib/render_thread.h>
 
 #include <EGL/egl.h>
@@ -209,6 +210,7 @@ void RunFamily(XWindow* window)
 
 void ExpectNothingLeft(void (*round)(XWindow*), XWindow* window)
 {
+    ASSERT_EQ(Egl::GetEglStatus(), 0) << "the driver does not start";
     for (int i = 0; i < kWarmUpRounds; ++i)
         round(window);
     const Holdings before;
@@ -227,6 +229,7 @@ void ExpectNothingLeft(void (*round)(XWindow*), XWindow* window)
 /// The test would find a name that is left.
 TEST(RenderThreadLeaks, ANameThatIsLeftIsSeen)
 {
+    ASSERT_EQ(Egl::GetEglStatus(), 0) << "the driver does not start";
     std::unique_ptr<RenderThreadGL> thread(
         GLES::CreateSurfaceRenderer("leaks", RenderThreadGL::Medium));
     thread->Start();

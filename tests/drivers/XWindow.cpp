@@ -19,7 +19,8 @@ namespace
 /// A test server starts anew when its last client goes, and then answers nobody for a moment.
 Display* OpenDisplay()
 {
-    if (std::getenv("DISPLAY") == nullptr)
+    const char* name = std::getenv("DISPLAY");
+    if (name == nullptr || *name == '\0')
         return nullptr;
     const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(5);
     Display* display = XOpenDisplay(nullptr);
