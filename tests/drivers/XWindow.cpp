@@ -1,5 +1,7 @@
 #include "drivers/XWindow.h"
 
+#include <gtest/gtest.h>
+
 #include <X11/Xlib.h>
 #include <X11/Xutil.h>
 
@@ -7,6 +9,7 @@
 #include <cstdint>
 #include <cstdlib>
 #include <stdexcept>
+#include <string_view>
 
 bool Near(const ShownColor& a, const ShownColor& b)
 {
@@ -16,11 +19,16 @@ bool Near(const ShownColor& a, const ShownColor& b)
 namespace
 {
 
+const char* Setting(const char* name)
+{
+    const char* value = std::getenv(name);
+    return value != nullptr ? value : "";
+}
+
 /// A test server starts anew when its last client goes, and then answers nobody for a moment.
 Display* OpenDisplay()
 {
-    const char* name = std::getenv("DISPLAY");
-    if (name == nullptr || *name == '\0')
+    if (std::string_view(Setting("DISPLAY")).empty())
         return nullptr;
     const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(5);
     Display* display = XOpenDisplay(nullptr);
@@ -29,10 +37,23 @@ Display* OpenDisplay()
     return display;
 }
 
+/// Makes each test program a client before EGL looks for the server.
+class ClientFromTheStart : public testing::Environment
+{
+public:
+    void SetUp() override { HasXServer(); }
+};
+
+[[maybe_unused]] const auto* const s_client =
+    testing::AddGlobalTestEnvironment(new ClientFromTheStart);
+
 } // namespace
 
 bool HasXServer()
 {
+    const std::string_view platform = Setting("EGL_PLATFORM");
+    if (!platform.empty() && platform != "x11")
+        return false;
     static const Display* const kept = OpenDisplay(); // the process stays a client to its end
     return kept != nullptr;
 }

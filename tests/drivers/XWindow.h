@@ -15,7 +15,7 @@ struct ShownColor
 /// Whether the two differ by no more than 1 in each part: drivers round differently.
 bool Near(const ShownColor& a, const ShownColor& b);
 
-/// Whether there is an X server to test with.
+/// Whether EGL draws in windows of an X server, and there is one.
 bool HasXServer();
 
 /// A window on the X server, on a connection of the test's own: what it shows is asked of the
