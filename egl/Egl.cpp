@@ -7,7 +7,6 @@
 #include <android/native_window.h>
 
 #include <cstring>
-#include <iterator>
 #include <vector>
 
 namespace Nib
@@ -16,62 +15,48 @@ namespace Nib
 namespace
 {
 
+// One attribute a line.
+// clang-format off
+
 // What eglChooseConfig is asked for. The colour sizes are minimums; alpha and depth are left out,
 // because the selection among the matches judges them.
 constexpr EGLint kOrdinaryAttributes[] = {
-    EGL_RENDERABLE_TYPE,
-    EGL_OPENGL_ES3_BIT_KHR, //
-    EGL_SURFACE_TYPE,
-    EGL_WINDOW_BIT | EGL_PBUFFER_BIT, //
-    EGL_RED_SIZE,
-    4, //
-    EGL_GREEN_SIZE,
-    4, //
-    EGL_BLUE_SIZE,
-    4, //
-    EGL_STENCIL_SIZE,
-    0, //
+    EGL_RENDERABLE_TYPE, EGL_OPENGL_ES3_BIT_KHR,
+    EGL_SURFACE_TYPE,    EGL_WINDOW_BIT | EGL_PBUFFER_BIT,
+    EGL_RED_SIZE,        4,
+    EGL_GREEN_SIZE,      4,
+    EGL_BLUE_SIZE,       4,
+    EGL_STENCIL_SIZE,    0,
     EGL_NONE,
 };
 
 constexpr EGLint kFrontBufferAttributes[] = {
-    EGL_RENDERABLE_TYPE,
-    EGL_OPENGL_ES3_BIT_KHR, //
-    EGL_SURFACE_TYPE,
-    EGL_MUTABLE_RENDER_BUFFER_BIT_KHR | EGL_WINDOW_BIT | EGL_PBUFFER_BIT, //
-    EGL_RED_SIZE,
-    4, //
-    EGL_GREEN_SIZE,
-    4, //
-    EGL_BLUE_SIZE,
-    4, //
-    EGL_STENCIL_SIZE,
-    0, //
+    EGL_RENDERABLE_TYPE, EGL_OPENGL_ES3_BIT_KHR,
+    EGL_SURFACE_TYPE,    EGL_MUTABLE_RENDER_BUFFER_BIT_KHR | EGL_WINDOW_BIT | EGL_PBUFFER_BIT,
+    EGL_RED_SIZE,        4,
+    EGL_GREEN_SIZE,      4,
+    EGL_BLUE_SIZE,       4,
+    EGL_STENCIL_SIZE,    0,
     EGL_NONE,
 };
 
 // The ordinary list where no window is ever to be drawn into.
 constexpr EGLint kPbufferAttributes[] = {
-    EGL_RENDERABLE_TYPE,
-    EGL_OPENGL_ES3_BIT_KHR, //
-    EGL_SURFACE_TYPE,
-    EGL_PBUFFER_BIT, //
-    EGL_RED_SIZE,
-    4, //
-    EGL_GREEN_SIZE,
-    4, //
-    EGL_BLUE_SIZE,
-    4, //
-    EGL_STENCIL_SIZE,
-    0, //
+    EGL_RENDERABLE_TYPE, EGL_OPENGL_ES3_BIT_KHR,
+    EGL_SURFACE_TYPE,    EGL_PBUFFER_BIT,
+    EGL_RED_SIZE,        4,
+    EGL_GREEN_SIZE,      4,
+    EGL_BLUE_SIZE,       4,
+    EGL_STENCIL_SIZE,    0,
     EGL_NONE,
 };
 
 constexpr EGLint kSubBufferSurfaceAttributes[] = {
-    EGL_POST_SUB_BUFFER_SUPPORTED_NV,
-    EGL_TRUE,
+    EGL_POST_SUB_BUFFER_SUPPORTED_NV, EGL_TRUE,
     EGL_NONE,
 };
+
+// clang-format on
 
 // Both are ready before any code of the library runs. The instance lives until the process ends.
 CriticalSection g_instanceLock(false);

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <climits>
+#include <cstdint>
 
 namespace Nib
 {
@@ -21,36 +22,44 @@ int Truncated(float value)
     return static_cast<int>(value);
 }
 
-constexpr int RoundedDown(int value, int multiple)
+// Wider than the coordinates, whose sums may not fit them: nothing bounds a caller's rectangle.
+using Wide = std::int64_t;
+
+constexpr Wide RoundedDown(Wide value, Wide multiple)
 {
     return value / multiple * multiple;
 }
 
-constexpr int RoundedUp(int value, int multiple)
+constexpr Wide RoundedUp(Wide value, Wide multiple)
 {
     return (value + multiple - 1) / multiple * multiple;
 }
 
 struct Span
 {
-    int start;
-    int length;
+    Wide start;
+    Wide length;
 };
 
 // Tiles are counted from where the screen's coordinates begin.
-Span AlignedFromStart(const Span& span, int screen, int tileSize)
+Span AlignedFromStart(const Span& span, Wide screen, Wide tileSize)
 {
-    const int start = RoundedDown(span.start, tileSize);
-    const int end = RoundedUp(span.start + span.length, tileSize);
+    const Wide start = RoundedDown(span.start, tileSize);
+    const Wide end = RoundedUp(span.start + span.length, tileSize);
     return {start, std::min(screen, end) - start};
 }
 
 // Tiles are counted from where the screen ends.
-Span AlignedFromEnd(const Span& span, int screen, int tileSize)
+Span AlignedFromEnd(const Span& span, Wide screen, Wide tileSize)
 {
-    const int distance = screen - span.start;
-    const int start = std::max(screen - RoundedUp(distance, tileSize), 0);
+    const Wide distance = screen - span.start;
+    const Wide start = std::max(screen - RoundedUp(distance, tileSize), Wide{0});
     return {start, screen - RoundedDown(distance - span.length, tileSize) - start};
+}
+
+int Narrowed(Wide value)
+{
+    return static_cast<int>(std::clamp(value, Wide{INT_MIN}, Wide{INT_MAX}));
 }
 
 } // namespace
@@ -83,7 +92,8 @@ ScissorBox AlignedToTiles(const ScissorBox& box, const ScreenSize& screen, int t
                                      : AlignedFromEnd({box.x, box.width}, screen.width, tileSize);
     const Span vertical = fromTop ? AlignedFromEnd({box.y, box.height}, screen.height, tileSize)
                                   : AlignedFromStart({box.y, box.height}, screen.height, tileSize);
-    return {horizontal.start, vertical.start, horizontal.length, vertical.length};
+    return {Narrowed(horizontal.start), Narrowed(vertical.start), Narrowed(horizontal.length),
+            Narrowed(vertical.length)};
 }
 
 ScissorBox DamageOfFrame(const RectF& bounds, const ScreenSize& screen)

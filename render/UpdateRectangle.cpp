@@ -235,8 +235,9 @@ void UpdateRectangle::RestrictToDirtyArea(const RectF& dirty, int rotation)
     OpenGLRenderer::bindFramebuffer(FramebufferTarget::ReadAndDraw, 0);
     const RectF area =
         ClipToScreen(m_clipRect->AddUpdateRect(&dirty), {m_screenWidth, m_screenHeight});
+    const int rotationIndex = static_cast<int>((std::int64_t{m_hwRotation} + rotation) % 4);
     ScissorBox box{};
-    GetScissorRect(area, &box.x, &box.y, &box.width, &box.height, (m_hwRotation + rotation) % 4);
+    GetScissorRect(area, &box.x, &box.y, &box.width, &box.height, rotationIndex);
     if ((m_mode & kDamageRegion) != 0)
     {
         m_damageRect = box;

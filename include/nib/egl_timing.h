@@ -84,8 +84,7 @@ public:
 
     /// For the next frame of the calling thread's current draw surface. Call it before that frame
     /// is presented, and ask for its times afterwards.
-    /// @return an object that the caller owns; null when the display has no frame times, or there
-    /// is
+    /// @return an object that the caller owns; null when the display has no frame times, there is
     ///         no current surface, or EGL refuses
     static EglFrameTime* GetForNextFrame();
 

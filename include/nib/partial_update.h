@@ -52,8 +52,7 @@ private:
 ///
 /// Threads  constructed anywhere; everything else on the render thread, with its context current.
 /// Order    Init for each new or resized surface; then for each frame UseRect (any number of
-/// times),
-///          drawing, Reset, DoSwapBuffers.
+///          times), drawing, Reset, DoSwapBuffers.
 /// Failure  a technique that the device lacks is not chosen; the last resort redraws everything.
 ///          Nothing throws.
 class NIB_EXPORT UpdateRectangle
