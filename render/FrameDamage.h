@@ -1,8 +1,9 @@
 #ifndef NIB_RENDER_FRAME_DAMAGE_H
 #define NIB_RENDER_FRAME_DAMAGE_H
 
-#include <nib/base.h>
-#include <nib/partial_update.h>
+#include "render/UpdateArithmetic.h"
+
+#include <utility>
 
 namespace Nib::GLES
 {
@@ -12,16 +13,18 @@ namespace Nib::GLES
 class FrameDamage
 {
 public:
-    /// The frame also changes @p rect: pixels, y growing downward.
-    void Add(const RectF& rect);
+    /// The frame also changes @p rect: window coordinates, in pixels.
+    void Add(const RectF& rect) { m_bounds.Union(rect); }
 
-    /// Ends the frame: the bounding box of what it changes, inside a screen of this size, in whole
-    /// pixels that cover it, counted from the bottom left. All of the screen when nothing of it is
-    /// known to change, so that a frame is never presented with an empty damage.
-    UpdateRectangle::DamageRect Take(int screenWidth, int screenHeight);
+    /// Ends the frame. All of the screen when nothing of it is known to change, so that no frame is
+    /// presented with an empty damage.
+    UpdateRectangle::DamageRect Take(const ScreenSize& screen)
+    {
+        return DamageOfFrame(std::exchange(m_bounds, RectF()), screen);
+    }
 
 private:
-    RectF m_bounds;
+    RectF m_bounds; // of all that was added
 };
 
 } // namespace Nib::GLES

@@ -96,11 +96,8 @@ void HWUIThreadGLImpl::RunLastTasks(const char* function)
 int HWUIThreadGLImpl::RemoveTasks(TaskQueue& queue)
 {
     int count = 0;
-    while (ITask* task = queue.Pop())
-    {
-        delete task;
+    while (const std::unique_ptr<ITask> task{queue.Pop()})
         ++count;
-    }
     return count;
 }
 
@@ -153,10 +150,9 @@ int HWUIThreadGLImpl::SwapQueues()
 void HWUIThreadGLImpl::RunTasks(TaskQueue* queue)
 {
     int count = 0;
-    while (ITask* task = queue->Pop())
+    while (const std::unique_ptr<ITask> task{queue->Pop()})
     {
         task->run();
-        delete task;
         ++count;
     }
     NIB_LOG_DEBUG("HWUIThreadGLImpl::RunTasks count=%d", count);

@@ -3,7 +3,7 @@
 
 #include "base/ThreadAnnotations.h"
 #include "render/HWUIObjectObserver.h"
-#include "render/LockFreeQueue.h"
+#include "thread/TaskQueue.h"
 
 #include <nib/base.h>
 #include <nib/render_thread.h>
@@ -63,8 +63,6 @@ public:
     void DoApplyUpdateRect(const RectF& rect);
 
 private:
-    using TaskQueue = LockFreeQueue<ITask>;
-
     void Init();
     void Post(ITask* task);
     int SwapQueues();

@@ -4,6 +4,7 @@
 #include "egl/EglTokens.h"
 #include "render/NewTask.h"
 #include "render/TaskFlags.h"
+#include "render/UpdateArithmetic.h"
 
 #include <nib/device.h>
 #include <nib/shader_manager.h>
@@ -19,26 +20,6 @@ constexpr Thread::ThreadPriority kWorkerPriority = -10;
 
 // OpenGLRenderer::discardFramebuffer
 constexpr int kDepthAndStencil = 6;
-
-/// A box of GL's window coordinates, from the bottom left.
-struct ScissorBox
-{
-    int x;
-    int y;
-    int width;
-    int height;
-};
-
-ScissorBox ScissorBoxOf(const RectF& rect, int screenHeight)
-{
-    if (rect.IsEmpty())
-        return {0, 0, 0, 0};
-    const RectF flipped(rect.left, static_cast<float>(screenHeight) - rect.bottom, rect.Width(),
-                        rect.Height());
-    Rect box;
-    box = flipped; // truncates each field
-    return {box.left, box.top, box.right, box.bottom};
-}
 
 } // namespace
 
@@ -261,12 +242,9 @@ void RenderThreadFBRImpl::ApplyUpdateRect(const RectF& rect, int rotation)
 void RenderThreadFBRImpl::UseRect(RectF rect, int)
 {
     OpenGLRenderer::bindFramebuffer(FramebufferTarget::ReadAndDraw, 0);
-    const int screenHeight = m_screenHeight.load(std::memory_order_relaxed);
-    const RectF screen(0.0f, 0.0f, static_cast<float>(m_screenWidth),
-                       static_cast<float>(screenHeight));
-    if (!rect.Intersect(screen))
-        rect = RectF();
-    const ScissorBox box = ScissorBoxOf(rect, screenHeight);
+    const ScreenSize screen = {m_screenWidth, m_screenHeight.load(std::memory_order_relaxed)};
+    const RectF visible = ClipToScreen(rect, screen);
+    const ScissorBox box = visible.IsEmpty() ? ScissorBox{} : FlippedBox(visible, screen);
     OpenGLRenderer::enableState(RenderState::ScissorTest); // until the next frame ends
     OpenGLRenderer::setScissor(box.x, box.y, static_cast<unsigned>(box.width),
                                static_cast<unsigned>(box.height));
@@ -274,7 +252,8 @@ void RenderThreadFBRImpl::UseRect(RectF rect, int)
 
 bool RenderThreadFBRImpl::GetScissorRect(const RectF& rect, int* x, int* y, int* width, int* height)
 {
-    const ScissorBox box = ScissorBoxOf(rect, m_screenHeight.load(std::memory_order_relaxed));
+    const ScreenSize screen = {0, m_screenHeight.load(std::memory_order_relaxed)};
+    const ScissorBox box = rect.IsEmpty() ? ScissorBox{} : FlippedBox(rect, screen);
     *x = box.x;
     *y = box.y;
     *width = box.width;

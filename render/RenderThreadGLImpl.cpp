@@ -169,8 +169,8 @@ bool RenderThreadGLImpl::Render()
 
 void RenderThreadGLImpl::DoRender()
 {
-    const UpdateRectangle::DamageRect damage =
-        m_frameDamage.Take(m_updateRectangle.GetScreenWidth(), m_updateRectangle.GetScreenHeight());
+    const UpdateRectangle::DamageRect damage = m_frameDamage.Take(
+        {m_updateRectangle.GetScreenWidth(), m_updateRectangle.GetScreenHeight()});
     if (!m_surface.IsAttachedToWindow())
         return OpenGLRenderer::finish();
     if (m_updateRectangle.NeedsDamageRect())

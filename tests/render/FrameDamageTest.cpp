@@ -22,7 +22,7 @@ TEST(FrameDamage, IsCountedFromTheBottomLeft)
 
     frame.Add(RectF(10, 20, 110, 70));
 
-    ExpectDamage(frame.Take(1920, 1080), 10, 1010, 100, 50);
+    ExpectDamage(frame.Take({1920, 1080}), 10, 1010, 100, 50);
 }
 
 TEST(FrameDamage, IsTheBoundingBoxOfAllRectangles)
@@ -32,7 +32,7 @@ TEST(FrameDamage, IsTheBoundingBoxOfAllRectangles)
     frame.Add(RectF(10, 20, 30, 40));
     frame.Add(RectF(100, 200, 120, 210));
 
-    ExpectDamage(frame.Take(1000, 500), 10, 290, 110, 190);
+    ExpectDamage(frame.Take({1000, 500}), 10, 290, 110, 190);
 }
 
 TEST(FrameDamage, IsRoundedOutward)
@@ -41,7 +41,7 @@ TEST(FrameDamage, IsRoundedOutward)
 
     frame.Add(RectF(10.9f, 20.1f, 30.1f, 39.9f));
 
-    ExpectDamage(frame.Take(100, 100), 10, 60, 21, 20);
+    ExpectDamage(frame.Take({100, 100}), 10, 60, 21, 20);
 }
 
 TEST(FrameDamage, IsClippedToTheScreen)
@@ -50,14 +50,14 @@ TEST(FrameDamage, IsClippedToTheScreen)
 
     frame.Add(RectF(-50, -50, 20, 2000));
 
-    ExpectDamage(frame.Take(100, 200), 0, 0, 20, 200);
+    ExpectDamage(frame.Take({100, 200}), 0, 0, 20, 200);
 }
 
 TEST(FrameDamage, WithoutARectangleIsTheScreen)
 {
     FrameDamage frame;
 
-    ExpectDamage(frame.Take(640, 480), 0, 0, 640, 480);
+    ExpectDamage(frame.Take({640, 480}), 0, 0, 640, 480);
 }
 
 TEST(FrameDamage, OutsideTheScreenIsTheScreen)
@@ -66,7 +66,7 @@ TEST(FrameDamage, OutsideTheScreenIsTheScreen)
 
     frame.Add(RectF(700, 10, 800, 20));
 
-    ExpectDamage(frame.Take(640, 480), 0, 0, 640, 480);
+    ExpectDamage(frame.Take({640, 480}), 0, 0, 640, 480);
 }
 
 TEST(FrameDamage, OfEmptyRectanglesIsTheScreen)
@@ -76,7 +76,7 @@ TEST(FrameDamage, OfEmptyRectanglesIsTheScreen)
     frame.Add(RectF(5, 5, 5, 9));
     frame.Add(RectF(9, 9, 5, 5));
 
-    ExpectDamage(frame.Take(640, 480), 0, 0, 640, 480);
+    ExpectDamage(frame.Take({640, 480}), 0, 0, 640, 480);
 }
 
 TEST(FrameDamage, AnEmptyRectangleAddsNothing)
@@ -86,19 +86,19 @@ TEST(FrameDamage, AnEmptyRectangleAddsNothing)
     frame.Add(RectF(10, 10, 20, 20));
     frame.Add(RectF(300, 300, 300, 400));
 
-    ExpectDamage(frame.Take(640, 480), 10, 460, 10, 10);
+    ExpectDamage(frame.Take({640, 480}), 10, 460, 10, 10);
 }
 
 TEST(FrameDamage, BelongsToOneFrame)
 {
     FrameDamage frame;
     frame.Add(RectF(10, 10, 20, 20));
-    frame.Take(640, 480);
+    frame.Take({640, 480});
 
-    ExpectDamage(frame.Take(640, 480), 0, 0, 640, 480);
+    ExpectDamage(frame.Take({640, 480}), 0, 0, 640, 480);
 
     frame.Add(RectF(30, 30, 40, 40));
-    ExpectDamage(frame.Take(640, 480), 30, 440, 10, 10);
+    ExpectDamage(frame.Take({640, 480}), 30, 440, 10, 10);
 }
 
 } // namespace

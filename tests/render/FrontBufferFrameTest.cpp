@@ -244,6 +244,47 @@ TEST_F(FrontBufferFrame, ASettingThatIsTakenButNotFollowedIsLogged)
               "not enable EGL_SINGLE_BUFFER mode -1");
 }
 
+TEST_F(FrontBufferFrame, ASurfaceThatBecomesSingleBufferedAllTheSameIsSwitched)
+{
+    Start();
+    Attach();
+    driver->FailWhen("eglSurfaceAttrib", 2, EGL_RENDER_BUFFER, EGL_BAD_MATCH);
+    // Between the refusal and the question, the surface has changed.
+    int queries = 0;
+    driver->OnCall("eglQuerySurface",
+                   [&]
+                   {
+                       if (++queries == 2)
+                           eglSurfaceAttrib(eglGetCurrentDisplay(), eglGetCurrentSurface(EGL_DRAW),
+                                            EGL_RENDER_BUFFER, EGL_SINGLE_BUFFER);
+                   });
+
+    EXPECT_TRUE(thread->Render());
+    driver->OnCall("eglQuerySurface", {});
+
+    EXPECT_EQ(driver->CallCount("eglSwapBuffers"), 1u);
+    const std::vector<std::string> lines = OwnLines();
+    ASSERT_EQ(lines.size(), 4u);
+    EXPECT_EQ(lines[0], "E void Nib::GLES::RenderThreadFBRImpl::EnableFrontBuffer() : Failed to "
+                        "enable EGL_SINGLE_BUFFER, err = 12297");
+    EXPECT_EQ(lines[1], "I void Nib::GLES::RenderThreadFBRImpl::EnableFrontBuffer() enabled "
+                        "EGL_SINGLE_BUFFER mode 12421");
+}
+
+TEST_F(FrontBufferFrame, AFailedSwapDoesNotStopTheSwitch)
+{
+    Start();
+    Attach();
+    driver->FailNext("eglSwapBuffers", EGL_BAD_SURFACE);
+
+    EXPECT_TRUE(thread->Render());
+
+    EXPECT_EQ(
+        driver->CountLogContaining("bool Nib::EglSurface::SwapBuffers() const Failed. Err = "), 1u);
+    EXPECT_EQ(driver->CallCount("eglSurfaceAttrib"), 2u);
+    EXPECT_EQ(OwnLines().size(), 3u);
+}
+
 TEST_F(FrontBufferFrame, RefusedAutoRefreshIsLoggedAfterTheSwap)
 {
     Start();
@@ -279,6 +320,34 @@ TEST_F(FrontBufferFrame, WithoutAutoRefreshOnTheDeviceTheValueIsUnknown)
     EXPECT_EQ(lines[2], "I void Nib::GLES::RenderThreadFBRImpl::DoRender() curr "
                         "EGL_RENDER_BUFFER=12421, curr EGL_FRONT_BUFFER_AUTO_REFRESH_ANDROID=-1, "
                         "EGL_BACK_BUFFER=12420, EGL_SINGLE_BUFFER=12421");
+}
+
+TEST_F(FrontBufferFrame, AWindowThatCannotBeAttachedLeavesTheSwitchPending)
+{
+    Start();
+    window = driver->Window(8, 8);
+    driver->AbandonWindow(window);
+    thread->OnSurfaceChanged(window, 8, 8, 0);
+    driver->ForgetCalls();
+
+    EXPECT_TRUE(thread->Render());
+
+    EXPECT_FALSE(thread->IsAttachedToWindow());
+    EXPECT_EQ(driver->CallCount(), 0u);
+}
+
+TEST_F(FrontBufferFrame, WithoutAFrontBufferConfigurationTheSwitchIsRefusedByTheWindow)
+{
+    System::SetDesktopFallbacks(false);
+    Start(SimGpu::Default().WithoutFrontBuffer());
+    driver->AllowMisuse(); // all of it without a context
+    Attach();
+
+    EXPECT_TRUE(thread->Render());
+    EXPECT_TRUE(thread->Render());
+
+    EXPECT_EQ(driver->CallCount("eglSwapBuffers"), 0u);
+    EXPECT_EQ(driver->CountLogContaining("could not enable EGL_SINGLE_BUFFER mode 12420"), 1u);
 }
 
 TEST_F(FrontBufferFrame, ARefusedSwitchIsNotTriedAgainForTheSameWindow)

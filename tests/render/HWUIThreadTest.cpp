@@ -6,6 +6,8 @@
 #include <nib/device.h>
 #include <nib/shader_manager.h>
 
+#include <stdexcept>
+
 using namespace Nib;
 
 namespace
@@ -216,6 +218,22 @@ TEST_F(HwuiTest, RenderDeletesEachTaskAfterItsRun)
 
     EXPECT_EQ(seen, (std::vector<int>{3, 2, 1})); // those before are gone already
     EXPECT_EQ(alive, 0);
+}
+
+TEST_F(HwuiTest, RenderLetsWhatATaskThrowsPassAndStaysUsable)
+{
+    thread->Render();
+    auto token = std::make_shared<int>(0);
+    Post(Queue(), [token] { throw std::runtime_error("from a task"); });
+    int ran = 0;
+    Post(Queue(), [&] { ++ran; });
+
+    EXPECT_THROW(thread->Render(), std::runtime_error);
+    EXPECT_EQ(token.use_count(), 1); // the task is gone
+
+    thread->Render(); // the queue that was filled meanwhile
+    thread->Render(); // the rest of the first one
+    EXPECT_EQ(ran, 1);
 }
 
 TEST_F(HwuiTest, ATaskPostedBetweenTwoFramesRunsInTheSecond)

@@ -347,6 +347,19 @@ TEST(RenderThreadGL, OnSurfaceChangedFallsBackOnThePbufferWithoutAWindowSurface)
     EXPECT_NE(ContextOf(*thread), EGL_NO_CONTEXT);
 }
 
+TEST(RenderThreadGL, OnSurfaceChangedGoesOnWhenTheContextCannotBeMadeCurrent)
+{
+    SimDriver driver;
+    ThreadPtr thread = StartedThread();
+    driver.ForgetLog();
+    driver.FailNext("eglMakeCurrent", EGL_BAD_ALLOC);
+
+    thread->OnSurfaceChanged(driver.Window(8, 8), 8, 8, 0);
+
+    EXPECT_TRUE(thread->IsAttachedToWindow());
+    EXPECT_EQ(driver.CountLogContaining("SetScreenRect(int, int). ScreenRect = 8 * 8"), 1u);
+}
+
 TEST(RenderThreadGL, OnSurfaceDestroyedKeepsTheContextCurrentOnThePbuffer)
 {
     SimDriver driver;

@@ -1,4 +1,4 @@
-#include "render/LockFreeQueue.h"
+#include "thread/TaskQueue.h"
 
 #include <gtest/gtest.h>
 
@@ -7,7 +7,6 @@
 #include <vector>
 
 using namespace Nib;
-using Queue = Nib::GLES::LockFreeQueue<ITask>;
 
 namespace
 {
@@ -21,23 +20,23 @@ public:
     const int number;
 };
 
-int PopNumber(Queue& queue)
+int PopNumber(TaskQueue& queue)
 {
     const std::unique_ptr<ITask> task(queue.Pop());
     return task ? static_cast<Numbered*>(task.get())->number : -1;
 }
 
-TEST(LockFreeQueue, StartsEmpty)
+TEST(TaskQueue, StartsEmpty)
 {
-    Queue queue;
+    TaskQueue queue;
 
     EXPECT_EQ(queue.Pop(), nullptr);
     EXPECT_EQ(queue.Pop(), nullptr);
 }
 
-TEST(LockFreeQueue, GivesItemsInTheirOrder)
+TEST(TaskQueue, GivesItemsInTheirOrder)
 {
-    Queue queue;
+    TaskQueue queue;
     for (int i = 0; i < 5; ++i)
         queue.Push(new Numbered(i));
 
@@ -46,9 +45,9 @@ TEST(LockFreeQueue, GivesItemsInTheirOrder)
     EXPECT_EQ(PopNumber(queue), -1);
 }
 
-TEST(LockFreeQueue, MayRunEmptyAndFillAgain)
+TEST(TaskQueue, MayRunEmptyAndFillAgain)
 {
-    Queue queue;
+    TaskQueue queue;
     for (int round = 0; round < 100; ++round)
     {
         for (int i = 0; i <= round % 3; ++i)
@@ -59,9 +58,9 @@ TEST(LockFreeQueue, MayRunEmptyAndFillAgain)
     }
 }
 
-TEST(LockFreeQueue, TakesItemsBetweenPops)
+TEST(TaskQueue, TakesItemsBetweenPops)
 {
-    Queue queue;
+    TaskQueue queue;
     queue.Push(new Numbered(0));
     queue.Push(new Numbered(1));
     EXPECT_EQ(PopNumber(queue), 0);
@@ -73,9 +72,9 @@ TEST(LockFreeQueue, TakesItemsBetweenPops)
     EXPECT_EQ(PopNumber(queue), -1);
 }
 
-TEST(LockFreeQueue, AnItemMayBePushedAgainOnceItIsTaken)
+TEST(TaskQueue, AnItemMayBePushedAgainOnceItIsTaken)
 {
-    Queue queue;
+    TaskQueue queue;
     Numbered item(7);
     for (int round = 0; round < 3; ++round)
     {
@@ -85,11 +84,11 @@ TEST(LockFreeQueue, AnItemMayBePushedAgainOnceItIsTaken)
     }
 }
 
-TEST(LockFreeQueue, LosesNothingAndKeepsEachProducersOrder)
+TEST(TaskQueue, LosesNothingAndKeepsEachProducersOrder)
 {
     constexpr int kProducers = 4;
     constexpr int kItems = 50'000;
-    Queue queue;
+    TaskQueue queue;
     std::vector<std::thread> producers;
     for (int producer = 0; producer < kProducers; ++producer)
     {
