@@ -1,7 +1,7 @@
 #include "gles/UniformBuffer.h"
 
 #include "base/Log.h"
-#include "gles/BufferUsageToGL.h"
+#include "gles/VertexFormats.h"
 
 namespace Nib::GLES
 {
@@ -18,7 +18,7 @@ UniformBuffer::UniformBuffer()
     glGenBuffers(1, &m_buffer);
     glBindBuffer(GL_UNIFORM_BUFFER, m_buffer);
     // The array buffer, not the uniform buffer, which gets its storage from the first Update.
-    glBufferData(GL_ARRAY_BUFFER, 0, nullptr, ToGL(m_usage));
+    glBufferData(GL_ARRAY_BUFFER, 0, nullptr, GetBufferUsage(m_usage));
     glBindBuffer(GL_UNIFORM_BUFFER, 0);
 }
 
@@ -31,7 +31,7 @@ void UniformBuffer::Release()
 void UniformBuffer::Update(const void* data, unsigned int size, BufferUsage usage)
 {
     glBindBuffer(GL_UNIFORM_BUFFER, m_buffer);
-    glBufferData(GL_UNIFORM_BUFFER, static_cast<GLsizeiptr>(size), data, ToGL(usage));
+    glBufferData(GL_UNIFORM_BUFFER, static_cast<GLsizeiptr>(size), data, GetBufferUsage(usage));
     glBindBuffer(GL_UNIFORM_BUFFER, 0);
     m_usage = usage;
     m_size = size;
