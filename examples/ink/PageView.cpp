@@ -35,7 +35,7 @@ constexpr float kCorners[] = {0, 0, 1, 0, 0, 1, 1, 1};
 
 } // namespace
 
-PageView::PageView(int width, int height) : m_width(width), m_height(height)
+PageView::PageView(int width, int height) : m_height(height)
 {
     using Factory = Nib::RendererFactory;
     m_window.reset(Factory::CreateRenderTargetFromDefault(width, height));

@@ -24,7 +24,6 @@ private:
     bool BackBufferIsKept() const;
     void LimitTo(const Nib::RectF& dirty) const;
 
-    int m_width;
     int m_height;
     bool m_isFirst = true;
     Owned<Nib::IRenderTarget> m_window;
