@@ -51,6 +51,17 @@ void UploadIndices(const void* data, unsigned count)
                  GL_DYNAMIC_DRAW);
 }
 
+/// An empty index buffer, which stays bound; 0 for no indices.
+GLuint MakeIndexBuffer(unsigned indexCount)
+{
+    if (indexCount == 0)
+        return 0;
+    const GLuint name = MakeBuffer();
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, name);
+    UploadIndices(nullptr, indexCount);
+    return name;
+}
+
 void UploadShortIndices(const void* data, unsigned count)
 {
     NIB_LOG_INFO("GL_UNSIGNED_INT index buffer not supported, performing conversion!");
@@ -164,80 +175,7 @@ void GraphicsObject::AllocateVertices(unsigned int index, const void* data) cons
                  GetBufferUsage(descriptor.usage));
 }
 
-/// An empty index buffer, which stays bound; 0 for no indices.
-GLuint GraphicsObject::MakeIndexBuffer(unsigned int indexCount) const
-{
-    if (indexCount == 0)
-        return 0;
-    const GLuint name = MakeBuffer();
-    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, name);
-    UploadIndices(nullptr, indexCount);
-    return name;
-}
-
 // ---- drawing ----
-
-GLuint GraphicsObject::SetUpAttributes(bool instanced) const
-{
-    GLuint location = 0;
-    for (unsigned int i = 0; i < m_bufferCount; ++i)
-        location = SetUpBuffer(i, location, instanced);
-    return location;
-}
-
-GLuint GraphicsObject::SetUpBuffer(unsigned int index, GLuint location, bool instanced) const
-{
-    const VertexDescriptor& descriptor = m_descriptors[index];
-    glBindBuffer(GL_ARRAY_BUFFER, m_vertexBuffers[index]);
-    if (descriptor.count > kMaxVertexAttributes)
-        NIB_ABORT("Error! Please, change value of variable MAX_VERTEX_ATTRIBS by %i",
-                  descriptor.count + 1);
-    for (int i = 0; i < descriptor.count; ++i, ++location)
-    {
-        glEnableVertexAttribArray(location);
-        glVertexAttribPointer(location, descriptor.components[i],
-                              kAttributeType[static_cast<int>(descriptor.types[i])], GL_FALSE,
-                              static_cast<GLsizei>(descriptor.stride),
-                              BufferOffset(static_cast<std::size_t>(descriptor.offsets[i])));
-        if (instanced)
-            glVertexAttribDivisor(location, static_cast<GLuint>(descriptor.divisors[i]));
-    }
-    return location;
-}
-
-void GraphicsObject::DrawIndices(PrimitiveType mode, unsigned int first, int count) const
-{
-    const IndexFormat format = StoredIndices();
-    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, m_indexBuffer);
-    glDrawElements(static_cast<GLenum>(mode),
-                   count == kWholeMesh ? static_cast<GLsizei>(m_indexCount) : count, format.type,
-                   BufferOffset(std::size_t{first} * format.bytes));
-    glBindBuffer(GL_ARRAY_BUFFER, 0);
-}
-
-GraphicsObject::IndexFormat GraphicsObject::StoredIndices() const
-{
-    return m_uintIndexSupported ? IndexFormat{GL_UNSIGNED_INT, 4}
-                                : IndexFormat{GL_UNSIGNED_SHORT, 2};
-}
-
-void GraphicsObject::DrawVertices(PrimitiveType mode, unsigned int first, int count) const
-{
-    if (m_bufferCount != 1)
-        NIB_ABORT("Please, provide proper count of vertex for drawing");
-    glDrawArrays(static_cast<GLenum>(mode), static_cast<GLint>(first),
-                 count == kWholeMesh ? static_cast<GLsizei>(m_vertexCounts[0]) : count);
-    glBindBuffer(GL_ARRAY_BUFFER, 0);
-}
-
-void GraphicsObject::Draw(PrimitiveType mode, unsigned int first, int count, bool useIndices) const
-{
-    SetUpAttributes(!kInstanced);
-    if (useIndices && m_indexBuffer != 0)
-        DrawIndices(mode, 0, count);
-    else
-        DrawVertices(mode, first, count);
-}
 
 void GraphicsObject::Draw(unsigned int first, int count, bool useIndices) const
 {
@@ -246,6 +184,17 @@ void GraphicsObject::Draw(unsigned int first, int count, bool useIndices) const
         DrawIndices(m_mode, first, count);
     else
         DrawVertices(m_mode, first, count);
+    glBindBuffer(GL_ARRAY_BUFFER, 0);
+}
+
+void GraphicsObject::Draw(PrimitiveType mode, unsigned int first, int count, bool useIndices) const
+{
+    SetUpAttributes(!kInstanced);
+    if (useIndices && m_indexBuffer != 0)
+        DrawIndices(mode, 0, count); // in a given mode, always from the first index on
+    else
+        DrawVertices(mode, first, count);
+    glBindBuffer(GL_ARRAY_BUFFER, 0);
 }
 
 void GraphicsObject::DrawInstanced(unsigned int first, int count, int instanceCount) const
@@ -263,19 +212,71 @@ void GraphicsObject::DrawInstanced(unsigned int first, int count, int instanceCo
     glBindBuffer(GL_ARRAY_BUFFER, 0);
 }
 
+/// Enables an array for each attribute of each buffer; the number of locations used.
+GLuint GraphicsObject::SetUpAttributes(bool instanced) const
+{
+    GLuint location = 0;
+    for (unsigned int i = 0; i < m_bufferCount; ++i)
+        location = SetUpBuffer(i, location, instanced);
+    return location;
+}
+
+/// The attributes of one buffer, from @p location on; the next free location.
+GLuint GraphicsObject::SetUpBuffer(unsigned int index, GLuint location, bool instanced) const
+{
+    const VertexDescriptor& layout = m_descriptors[index];
+    glBindBuffer(GL_ARRAY_BUFFER, m_vertexBuffers[index]);
+    if (layout.count > kMaxVertexAttributes)
+        NIB_ABORT("Error! Please, change value of variable MAX_VERTEX_ATTRIBS by %i",
+                  layout.count + 1);
+    for (int i = 0; i < layout.count; ++i, ++location)
+    {
+        glEnableVertexAttribArray(location);
+        glVertexAttribPointer(location, layout.components[i], GetAttributeType(layout.types[i]),
+                              GL_FALSE, static_cast<GLsizei>(layout.stride),
+                              BufferOffset(static_cast<std::size_t>(layout.offsets[i])));
+        if (instanced)
+            glVertexAttribDivisor(location, static_cast<GLuint>(layout.divisors[i]));
+    }
+    return location;
+}
+
+void GraphicsObject::DrawIndices(PrimitiveType mode, unsigned int first, int count) const
+{
+    const IndexFormat format = StoredIndices();
+    glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, m_indexBuffer);
+    glDrawElements(static_cast<GLenum>(mode),
+                   count == kWholeMesh ? static_cast<GLsizei>(m_indexCount) : count, format.type,
+                   BufferOffset(std::size_t{first} * format.bytes));
+}
+
+void GraphicsObject::DrawVertices(PrimitiveType mode, unsigned int first, int count) const
+{
+    if (m_bufferCount != 1)
+        NIB_ABORT("Please, provide proper count of vertex for drawing");
+    glDrawArrays(static_cast<GLenum>(mode), static_cast<GLint>(first),
+                 count == kWholeMesh ? static_cast<GLsizei>(m_vertexCounts[0]) : count);
+}
+
+GraphicsObject::IndexFormat GraphicsObject::StoredIndices() const
+{
+    return m_uintIndexSupported ? IndexFormat{GL_UNSIGNED_INT, 4}
+                                : IndexFormat{GL_UNSIGNED_SHORT, 2};
+}
+
 // ---- the end, and the loss of the context ----
+
+void GraphicsObject::freeBuffer()
+{
+    Unregister();
+    DeleteNames();
+}
 
 void GraphicsObject::DeleteNames()
 {
     for (GLuint& name : m_vertexBuffers)
         DeleteBuffer(name);
     DeleteBuffer(m_indexBuffer);
-}
-
-void GraphicsObject::freeBuffer()
-{
-    Unregister();
-    DeleteNames();
 }
 
 void GraphicsObject::ReleaseGLObject()
@@ -296,7 +297,8 @@ void GraphicsObject::RestoreGLObject()
         m_vertexBuffers[i] = MakeBuffer();
         AllocateVertices(i, nullptr);
     }
-    m_indexBuffer = MakeIndexBuffer(m_indexCount);
+    if (m_indexBuffer == 0)
+        m_indexBuffer = MakeIndexBuffer(m_indexCount);
     glBindBuffer(GL_ARRAY_BUFFER, 0);
     NIB_LOG_INFO("%s - Restore Was called. Graphics After - %d(err:%d)", function,
                  static_cast<int>(m_vertexBuffers[0]), static_cast<int>(glGetError()));

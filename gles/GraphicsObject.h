@@ -65,7 +65,6 @@ private:
 
     IndexFormat StoredIndices() const;
     void AllocateVertices(unsigned int index, const void* data) const;
-    GLuint MakeIndexBuffer(unsigned int indexCount) const;
     GLuint SetUpAttributes(bool instanced) const;
     GLuint SetUpBuffer(unsigned int index, GLuint location, bool instanced) const;
     void DrawIndices(PrimitiveType mode, unsigned int first, int count) const;

@@ -42,6 +42,11 @@ inline constexpr GLenum kBufferUsage[] = {
     GL_DYNAMIC_DRAW, // 2
 };
 
+constexpr GLenum GetAttributeType(VertexDescriptor::AttributeType type)
+{
+    return kAttributeType[static_cast<int>(type)];
+}
+
 constexpr GLenum GetBufferUsage(BufferUsage usage)
 {
     return kBufferUsage[static_cast<int>(usage)];
