@@ -4,6 +4,7 @@
 #include <nib/exceptions.h>
 
 #include "base/Log.h"
+#include "gles/BufferUsageToGL.h"
 #include "gles/Throw.h"
 #include "gles/VertexFormats.h"
 
@@ -172,7 +173,7 @@ void GraphicsObject::AllocateVertices(unsigned int index, const void* data) cons
     const VertexDescriptor& descriptor = m_descriptors[index];
     glBindBuffer(GL_ARRAY_BUFFER, m_vertexBuffers[index]);
     glBufferData(GL_ARRAY_BUFFER, ByteSize(descriptor, m_vertexCounts[index]), data,
-                 GetBufferUsage(descriptor.usage));
+                 ToGL(descriptor.usage));
 }
 
 // ---- drawing ----
