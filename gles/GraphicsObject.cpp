@@ -4,7 +4,6 @@
 #include <nib/exceptions.h>
 
 #include "base/Log.h"
-#include "gles/BufferUsageToGL.h"
 #include "gles/Throw.h"
 #include "gles/VertexFormats.h"
 
@@ -173,7 +172,7 @@ void GraphicsObject::AllocateVertices(unsigned int index, const void* data) cons
     const VertexDescriptor& descriptor = m_descriptors[index];
     glBindBuffer(GL_ARRAY_BUFFER, m_vertexBuffers[index]);
     glBufferData(GL_ARRAY_BUFFER, ByteSize(descriptor, m_vertexCounts[index]), data,
-                 ToGL(descriptor.usage));
+                 GetBufferUsage(descriptor.usage));
 }
 
 // ---- drawing ----

@@ -35,9 +35,21 @@ inline constexpr GLenum kAttributeType[] = {
 static_assert(std::size(aAttributeByteSizes) == std::size(kAttributeType),
               "both have one row per AttributeType");
 
+// BufferUsage -> GL usage
+inline constexpr GLenum kBufferUsage[] = {
+    GL_STREAM_DRAW,  // 0
+    GL_STATIC_DRAW,  // 1
+    GL_DYNAMIC_DRAW, // 2
+};
+
 constexpr GLenum GetAttributeType(VertexDescriptor::AttributeType type)
 {
     return kAttributeType[static_cast<int>(type)];
+}
+
+constexpr GLenum GetBufferUsage(BufferUsage usage)
+{
+    return kBufferUsage[static_cast<int>(usage)];
 }
 
 } // namespace Nib::GLES

@@ -1,4 +1,3 @@
-#include "gles/BufferUsageToGL.h"
 #include "gles/GlesFixture.h"
 #include "gles/VertexFormats.h"
 
@@ -89,9 +88,9 @@ TEST(VertexDescriptor, TypesHaveTheirGlTypeAndSize)
 
 TEST(VertexDescriptor, UsagesAndPrimitivesAreGls)
 {
-    EXPECT_EQ(Nib::GLES::ToGL(BufferUsage::Stream), 0x88E0u);
-    EXPECT_EQ(Nib::GLES::ToGL(BufferUsage::Static), 0x88E4u);
-    EXPECT_EQ(Nib::GLES::ToGL(BufferUsage::Dynamic), 0x88E8u);
+    EXPECT_EQ(Nib::GLES::GetBufferUsage(BufferUsage::Stream), 0x88E0u);
+    EXPECT_EQ(Nib::GLES::GetBufferUsage(BufferUsage::Static), 0x88E4u);
+    EXPECT_EQ(Nib::GLES::GetBufferUsage(BufferUsage::Dynamic), 0x88E8u);
     EXPECT_EQ(static_cast<int>(BufferUsage::Stream), 0);
     EXPECT_EQ(static_cast<int>(BufferUsage::Static), 1);
     EXPECT_EQ(static_cast<int>(PrimitiveType::Points), 0);
