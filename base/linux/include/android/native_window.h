@@ -11,10 +11,10 @@ extern "C"
 {
 #endif
 
-typedef struct ANativeWindow ANativeWindow;
+    typedef struct ANativeWindow ANativeWindow;
 
-int32_t ANativeWindow_setBuffersGeometry(ANativeWindow* window, int32_t width, int32_t height,
-                                         int32_t format);
+    int32_t ANativeWindow_setBuffersGeometry(ANativeWindow* window, int32_t width, int32_t height,
+                                             int32_t format);
 
 #ifdef __cplusplus
 }
