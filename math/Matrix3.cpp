@@ -80,6 +80,7 @@ Matrix3<T>::Matrix3(const T& m0, const T& m1, const T& m2, const T& m3, const T&
 template <typename T>
 bool Matrix3<T>::operator==(const Matrix3& other) const
 {
+    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): byte by byte is the exported rule
     return std::memcmp(m_elements, other.m_elements, sizeof m_elements) == 0;
 }
 

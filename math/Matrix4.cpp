@@ -69,6 +69,7 @@ Matrix4<T>::Matrix4(const T& m0, const T& m1, const T& m2, const T& m3, const T&
 template <typename T>
 bool Matrix4<T>::operator==(const Matrix4& other) const
 {
+    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): byte by byte is the exported rule
     return std::memcmp(m_elements, other.m_elements, sizeof m_elements) == 0;
 }
 

@@ -65,8 +65,11 @@ bool RenderThreadFBRImpl::Start()
     return started;
 }
 
+// The task passes copies, which keep the worker alive while this runs.
+// NOLINTBEGIN(performance-unnecessary-value-param)
 void RenderThreadFBRImpl::GetContextAndResume(ContextHandshake::Worker worker,
                                               ContextHandshake::Cell cell)
+// NOLINTEND(performance-unnecessary-value-param)
 {
     NIB_FUNCTION("static void Nib::GLES::RenderThreadFBRImpl::GetContextAndResume("
                  "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>)");

@@ -72,8 +72,11 @@ bool RenderThreadOffscreenGLImpl::Start()
     return started;
 }
 
+// The task passes copies, which keep the worker alive while this runs.
+// NOLINTBEGIN(performance-unnecessary-value-param)
 void RenderThreadOffscreenGLImpl::GetContextAndResume(ContextHandshake::Worker worker,
                                                       ContextHandshake::Cell cell)
+// NOLINTEND(performance-unnecessary-value-param)
 {
     NIB_FUNCTION("static void Nib::GLES::RenderThreadOffscreenGLImpl::GetContextAndResume("
                  "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>)");
