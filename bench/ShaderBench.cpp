@@ -1,0 +1,204 @@
+// What it costs to have a shader program: from the cache in memory, from its file, from source,
+// each beside the GL calls alone. Everything runs on a render thread, with a cache folder of its
+// own.
+//
+// Every iteration that compiles or reads a file has a source of its own, told apart by a comment,
+// so that neither this cache nor the driver's knows it.
+
+#include <nib/msg_queue.h>
+#include <nib/render_thread.h>
+#include <nib/renderer_factory.h>
+#include <nib/shader_cache.h>
+#include <nib/task.h>
+
+#include <GLES3/gl3.h>
+
+#include <benchmark/benchmark.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <memory>
+#include <string>
+#include <vector>
+
+using namespace Nib;
+namespace fs = std::filesystem;
+
+namespace
+{
+
+constexpr int kPrograms = 500; // sources, files and records of one benchmark
+
+const std::string kVertex = "attribute vec2 a_position;\n"
+                            "attribute vec4 a_color;\n"
+                            "uniform mat4 u_transform;\n"
+                            "varying vec4 v_color;\n"
+                            "void main()\n"
+                            "{\n"
+                            "    v_color = a_color;\n"
+                            "    gl_Position = u_transform * vec4(a_position, 0.0, 1.0);\n"
+                            "}\n";
+const char* const kFragment =
+    "precision mediump float;\n"
+    "varying vec4 v_color;\n"
+    "uniform sampler2D u_tip;\n"
+    "uniform vec4 u_tint;\n"
+    "void main()\n"
+    "{\n"
+    "    gl_FragColor = v_color * u_tint * texture2D(u_tip, v_color.xy);\n"
+    "}\n";
+
+std::vector<std::string> NewVertexSources()
+{
+    static int number = 0;
+    std::vector<std::string> sources;
+    for (int i = 0; i < kPrograms; ++i)
+        sources.push_back(kVertex + "// " + std::to_string(++number) + "\n");
+    return sources;
+}
+
+IShaderProgram* Build(const std::string& vertex)
+{
+    return RendererFactory::CreateShaderProgram(vertex.c_str(), kFragment, nullptr);
+}
+
+// The record of the plain source, which every benchmark starts from.
+const ShaderProgramCache::BinaryShader& KnownBinary()
+{
+    const auto key = ShaderProgramCache::GetShaderKey(kVertex.c_str(), kFragment);
+    Build(kVertex)->Release();
+    return *ShaderProgramCache::GetInstance()->GetBinaryShader(key);
+}
+
+fs::path FileOf(ShaderProgramCache::BinaryShaderKey key)
+{
+    return fs::path(System::GetSDKCacheDirectoryPath()).parent_path() / "RendererCache" /
+           ("sh" + std::to_string(key) + ".dat");
+}
+
+GLuint Compiled(GLenum type, const char* source)
+{
+    const GLuint shader = glCreateShader(type);
+    glShaderSource(shader, 1, &source, nullptr);
+    glCompileShader(shader);
+    GLint status = GL_FALSE;
+    glGetShaderiv(shader, GL_COMPILE_STATUS, &status);
+    return status == GL_TRUE ? shader : 0;
+}
+
+bool IsLinked(GLuint program)
+{
+    GLint status = GL_FALSE;
+    glGetProgramiv(program, GL_LINK_STATUS, &status);
+    return status == GL_TRUE;
+}
+
+// ---- the measure: GL alone ----------------------------------------------------------------------
+
+void BM_GlProgramBinary(benchmark::State& state)
+{
+    const ShaderProgramCache::BinaryShader& binary = KnownBinary();
+    for (auto _ : state)
+    {
+        const GLuint program = glCreateProgram();
+        glProgramBinary(program, binary.format, binary.bytes, binary.length);
+        if (!IsLinked(program))
+            state.SkipWithError("the driver refuses its binary");
+        glDeleteProgram(program);
+    }
+    state.counters["bytes"] = binary.length;
+}
+BENCHMARK(BM_GlProgramBinary);
+
+void BM_GlCompileAndLink(benchmark::State& state)
+{
+    const std::vector<std::string> sources = NewVertexSources();
+    auto source = sources.begin();
+    for (auto _ : state)
+    {
+        const GLuint vertex = Compiled(GL_VERTEX_SHADER, (source++)->c_str());
+        const GLuint fragment = Compiled(GL_FRAGMENT_SHADER, kFragment);
+        const GLuint program = glCreateProgram();
+        glAttachShader(program, vertex);
+        glAttachShader(program, fragment);
+        glLinkProgram(program);
+        if (!IsLinked(program))
+            state.SkipWithError("the driver does not link");
+        glDeleteShader(vertex);
+        glDeleteShader(fragment);
+        glDeleteProgram(program);
+    }
+}
+BENCHMARK(BM_GlCompileAndLink)->Iterations(kPrograms);
+
+// ---- the library --------------------------------------------------------------------------------
+
+// Read as a ratio to BM_GlProgramBinary: the key, one look-up, the subscription and an INFO line.
+void BM_ProgramFromMemory(benchmark::State& state)
+{
+    KnownBinary();
+    for (auto _ : state)
+        Build(kVertex)->Release();
+}
+BENCHMARK(BM_ProgramFromMemory);
+
+// Read as a ratio to BM_GlProgramBinary: besides, one file that the system still has in memory.
+void BM_ProgramFromDisk(benchmark::State& state)
+{
+    const fs::path file = FileOf(KnownBinary().key);
+    const std::vector<std::string> sources = NewVertexSources();
+    for (const std::string& source : sources)
+        fs::copy_file(file, FileOf(ShaderProgramCache::GetShaderKey(source.c_str(), kFragment)));
+    auto source = sources.begin();
+    for (auto _ : state)
+        Build(*source++)->Release();
+}
+BENCHMARK(BM_ProgramFromDisk)->Iterations(kPrograms);
+
+// Read as a ratio to BM_GlCompileAndLink: besides, the binary is fetched and its file written.
+void BM_ProgramFromSource(benchmark::State& state)
+{
+    const std::vector<std::string> sources = NewVertexSources();
+    auto source = sources.begin();
+    for (auto _ : state)
+        Build(*source++)->Release();
+}
+BENCHMARK(BM_ProgramFromSource)->Iterations(kPrograms);
+
+class BenchmarkTask : public ITask
+{
+public:
+    void run() override { benchmark::RunSpecifiedBenchmarks(); }
+};
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    std::string folder = (fs::temp_directory_path() / "nib-bench-XXXXXX").string();
+    if (!mkdtemp(folder.data()))
+        return 1;
+    System::SetSDKCacheDirectoryPath((folder + "/sdk").c_str());
+    setenv("MESA_SHADER_CACHE_DIR", (folder + "/driver").c_str(), 1);
+    setenv("NIB_LOG", "silent", 0);
+    if (!std::getenv("DISPLAY"))
+        setenv("EGL_PLATFORM", "surfaceless", 0);
+    benchmark::Initialize(&argc, argv);
+
+    std::unique_ptr<RenderThreadGL> thread(
+        GLES::CreateSurfaceRenderer("bench", RenderThreadGL::Medium));
+    const bool started = thread->Start();
+    if (started)
+    {
+        thread->GetMsgQueue()->enQueueMsg(new BenchmarkTask);
+        thread->GetMsgQueue()->waitForCompleting();
+    }
+    else
+    {
+        std::fprintf(stderr, "the driver does not start\n");
+    }
+    thread.reset();
+    fs::remove_all(folder);
+    return started ? 0 : 1;
+}
