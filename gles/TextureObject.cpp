@@ -10,6 +10,7 @@
 #include "gles/TextureParams.h"
 #include "gles/TextureSpecification.h"
 #include "gles/Throw.h"
+#include "gles/UnpackState.h"
 
 #include <algorithm>
 #include <cstring>
@@ -21,9 +22,6 @@ namespace Nib::GLES
 
 namespace
 {
-
-constexpr GLenum kTexture1D = 0x0DE0;        // GL_TEXTURE_1D and its binding, which OpenGL ES
-constexpr GLenum kTextureBinding1D = 0x8068; // does not have
 
 /// The names of a texture that is being made; deletes them unless they are handed on.
 class NewNames
@@ -58,51 +56,6 @@ private:
     GLuint m_texture = 0;
     GLuint m_sampler = 0;
 };
-
-/// Sets the row length of uploads, unless it is 0, until the end of the scope.
-class UnpackRowLength
-{
-public:
-    explicit UnpackRowLength(int rowLength) : m_set(rowLength != 0)
-    {
-        if (!m_set)
-            return;
-        glGetIntegerv(GL_UNPACK_ROW_LENGTH, &m_previous);
-        glPixelStorei(GL_UNPACK_ROW_LENGTH, rowLength);
-    }
-    ~UnpackRowLength()
-    {
-        if (m_set)
-            glPixelStorei(GL_UNPACK_ROW_LENGTH, m_previous);
-    }
-    UnpackRowLength(const UnpackRowLength&) = delete;
-    UnpackRowLength& operator=(const UnpackRowLength&) = delete;
-
-private:
-    const bool m_set;
-    GLint m_previous = 0;
-};
-
-void SetUnpackSkips(int pixels, int rows)
-{
-    glPixelStorei(GL_UNPACK_SKIP_PIXELS, pixels);
-    glPixelStorei(GL_UNPACK_SKIP_ROWS, rows);
-}
-
-/// What tells which texture is bound to @p target. An external texture is told apart by the value
-/// of the sampler type, so that its target gets the last answer.
-GLenum BindingOf(GLenum target)
-{
-    switch (target)
-    {
-    case kTexture1D: return kTextureBinding1D;
-    case GL_TEXTURE_2D: return GL_TEXTURE_BINDING_2D;
-    case GL_TEXTURE_2D_ARRAY: return GL_TEXTURE_BINDING_2D_ARRAY;
-    case GL_TEXTURE_3D: return GL_TEXTURE_BINDING_3D;
-    case GL_SAMPLER_EXTERNAL_OES: return GL_TEXTURE_BINDING_EXTERNAL_OES;
-    default: return GL_TEXTURE_BINDING_CUBE_MAP;
-    }
-}
 
 void RequireSize(const TextureDescriptor& descriptor)
 {
@@ -166,24 +119,6 @@ TextureObject::TextureInternals Build(bool withSampler, const TextureDescriptor&
         glFlush();
     }
     return internals;
-}
-
-/// Level 0 of a texture that is bound, at its size. The targets that are not named keep theirs.
-void SpecifyImage(GLenum target, const TextureDescriptor& descriptor, const void* pixels,
-                  int rowLength)
-{
-    switch (target)
-    {
-    case kTexture1D: return SpecifyImage1D(descriptor, pixels);
-    case GL_TEXTURE_2D:
-    {
-        const UnpackRowLength setRowLength(rowLength);
-        return SpecifyImage2D(descriptor, pixels);
-    }
-    case GL_TEXTURE_3D: return SpecifyImage3D(target, descriptor, pixels);
-    case GL_SAMPLER_EXTERNAL_OES: Throw<NotSupportedException>();
-    default: return;
-    }
 }
 
 } // namespace
@@ -331,7 +266,7 @@ void TextureObject::SetData(const void* pixels, int rowLength)
 {
     RequireSize(m_internals.descriptor);
     GLint previous = 0;
-    glGetIntegerv(BindingOf(m_internals.target), &previous);
+    glGetIntegerv(GetTextureBinding(m_internals.target), &previous);
     Bind();
     SpecifyImage(m_internals.target, m_internals.descriptor, pixels, rowLength);
     glBindTexture(m_internals.target, static_cast<GLuint>(previous));

@@ -7,6 +7,7 @@
 #include "gles/TextureAccounting.h"
 #include "gles/TextureParams.h"
 #include "gles/Throw.h"
+#include "gles/UnpackState.h"
 
 #include <iterator>
 
@@ -16,7 +17,8 @@ namespace Nib::GLES
 namespace
 {
 
-constexpr GLenum kTexture1D = 0x0DE0; // GL_TEXTURE_1D, which OpenGL ES does not have
+constexpr GLenum kTexture1D = 0x0DE0;        // GL_TEXTURE_1D and its binding, which OpenGL ES
+constexpr GLenum kTextureBinding1D = 0x8068; // does not have
 constexpr GLenum kUnsupportedType = 0xFFFFFFFF;
 
 // TextureDescriptor::target -> GL target
@@ -51,24 +53,6 @@ void SpecifyFlatImage(GLenum target, const TextureDescriptor& descriptor, GLsize
                  GetTextureType(descriptor.layout, descriptor.memoryLayout), pixels);
 }
 
-} // namespace
-
-GLenum GetTextureTarget(int target)
-{
-    return kTextureTargets[target];
-}
-
-bool IsTextureTarget(int target)
-{
-    return static_cast<unsigned>(target) < std::size(kTextureTargets);
-}
-
-void RequireSupportedType(GLenum type)
-{
-    if (type == kUnsupportedType)
-        Throw<OGLVersionNotSupportedException>();
-}
-
 void SpecifyImage1D(const TextureDescriptor& descriptor, const void* pixels)
 {
     RequireSupportedType(GetTextureType(descriptor.layout, descriptor.memoryLayout));
@@ -85,6 +69,54 @@ void SpecifyImage3D(GLenum target, const TextureDescriptor& descriptor, const vo
     glTexImage3D(target, 0, InternalFormat(descriptor), descriptor.width, descriptor.height,
                  descriptor.depth, 0, GetTextureFormat(descriptor.layout),
                  GetTextureType(descriptor.layout, descriptor.memoryLayout), pixels);
+}
+
+} // namespace
+
+bool IsTextureTarget(int target)
+{
+    return static_cast<unsigned>(target) < std::size(kTextureTargets);
+}
+
+GLenum GetTextureTarget(int target)
+{
+    return IsTextureTarget(target) ? kTextureTargets[target] : 0;
+}
+
+GLenum GetTextureBinding(GLenum target)
+{
+    switch (target)
+    {
+    case kTexture1D: return kTextureBinding1D;
+    case GL_TEXTURE_2D: return GL_TEXTURE_BINDING_2D;
+    case GL_TEXTURE_2D_ARRAY: return GL_TEXTURE_BINDING_2D_ARRAY;
+    case GL_TEXTURE_3D: return GL_TEXTURE_BINDING_3D;
+    case GL_SAMPLER_EXTERNAL_OES: return GL_TEXTURE_BINDING_EXTERNAL_OES;
+    default: return GL_TEXTURE_BINDING_CUBE_MAP;
+    }
+}
+
+void RequireSupportedType(GLenum type)
+{
+    if (type == kUnsupportedType)
+        Throw<OGLVersionNotSupportedException>();
+}
+
+void SpecifyImage(GLenum target, const TextureDescriptor& descriptor, const void* pixels,
+                  int rowLength)
+{
+    switch (target)
+    {
+    case kTexture1D: return SpecifyImage1D(descriptor, pixels);
+    case GL_TEXTURE_2D:
+    {
+        const UnpackRowLength setRowLength(rowLength);
+        return SpecifyImage2D(descriptor, pixels);
+    }
+    case GL_TEXTURE_3D: return SpecifyImage3D(target, descriptor, pixels);
+    case GL_SAMPLER_EXTERNAL_OES: Throw<NotSupportedException>();
+    default: return;
+    }
 }
 
 void SamplingParameters::Set(GLenum name, GLint value) const

@@ -17,17 +17,18 @@ bool IsTextureTarget(int target);
 /// The GL target of a target index; 0 when there is none.
 GLenum GetTextureTarget(int target);
 
+/// What tells which texture is bound to @p target. An external texture is told apart by the value
+/// of the sampler type, so that its target gets the last answer.
+GLenum GetTextureBinding(GLenum target);
+
 /// Throws OGLVersionNotSupportedException for the mark of a pair of layouts that cannot be used.
 void RequireSupportedType(GLenum type);
 
-/// Level 0 of the texture bound to GL_TEXTURE_2D, at the descriptor's size.
-void SpecifyImage2D(const TextureDescriptor& descriptor, const void* pixels);
-
-/// Level 0 of the 1D texture that is bound.
-void SpecifyImage1D(const TextureDescriptor& descriptor, const void* pixels);
-
-/// Level 0 of the texture bound to @p target, an array or a 3D texture.
-void SpecifyImage3D(GLenum target, const TextureDescriptor& descriptor, const void* pixels);
+/// Level 0 of the texture that is bound to @p target, at the descriptor's size: 1D, 2D and 3D
+/// textures. Any other keeps what it has, and a target that is GL_SAMPLER_EXTERNAL_OES throws
+/// NotSupportedException.
+void SpecifyImage(GLenum target, const TextureDescriptor& descriptor, const void* pixels,
+                  int rowLength);
 
 /// Where sampling parameters go: into a sampler object, or into the texture that is bound.
 class SamplingParameters

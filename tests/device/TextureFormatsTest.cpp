@@ -52,3 +52,33 @@ TEST(TextureFormats, IrregularCellsOfTheTypeTableStay)
     EXPECT_EQ(type(5, 12), 0x1405u);
     EXPECT_EQ(type(7, 14), 0u);
 }
+
+TEST(TextureFormats, EveryCellOfTheTypeTable)
+{
+    constexpr unsigned B = 0x1401, US = 0x1403, S = 0x1402, UI = 0x1405, I = 0x1404, F = 0x1406,
+                       HF = 0x140B;
+    // One row a layout, one column a memory layout, 0 to 16.
+    constexpr unsigned expected[8][17] = {
+        {B, US, S, UI, I, B, B, F, F, F, F, HF, UI, B, 0, F, 0}, // 0
+        {B, US, S, UI, I, B, B, F, F, F, F, HF, UI, B, 0, 0, 0}, // 1
+        {0, 0, 0, 0, 0, 0, B, B, F, F, F, HF, UI, 0, F, B, B},   // 2
+        {B, US, S, UI, I, B, B, F, F, F, F, HF, UI, B, 0, 0, 0}, // 3
+        {0, 0, 0, 0, 0, 0, 0, 0, F, F, F, HF, UI, B, 0, 0, 0},   // 4
+        {0, 0, 0, 0, 0, 0, B, B, F, F, F, HF, UI, B, 0, 0, 0},   // 5
+        {0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, B, 0, 0, 0},     // 6
+        {0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, B, 0, B, B},     // 7
+    };
+    for (int layout = 0; layout < 8; ++layout)
+        for (int memoryLayout = 0; memoryLayout < 17; ++memoryLayout)
+            EXPECT_EQ(GLES::GetTextureType(static_cast<TextureTargetLayout>(layout),
+                                           static_cast<TextureMemoryLayout>(memoryLayout)),
+                      expected[layout][memoryLayout])
+                << layout << ", " << memoryLayout;
+}
+
+TEST(TextureFormats, NoPairIsMarkedAsUnsupported)
+{
+    for (const auto& row : GLES::kTextureType.rows)
+        for (const unsigned type : row)
+            EXPECT_NE(type, 0xFFFFFFFFu);
+}
