@@ -5,6 +5,7 @@
 
 #include <cstdio>
 #include <memory>
+#include <thread>
 
 using Nib::Egl;
 using Nib::EglContext;
@@ -621,4 +622,73 @@ TEST(EglFrameTime, DeletingAnObjectCallsNothing)
     frame.reset();
 
     EXPECT_EQ(device.driver.CallCount(), 0u);
+}
+
+// ---- threads and slots --------------------------------------------------------------------------
+
+TEST(EglFrameTime, FirstCallsOfTwoThreadsAreHarmless)
+{
+    OpenDisplay display(TimingDevice());
+    display.driver.Hold("eglGetProcAddress");
+    std::thread first([] { EglFrameTimeImpl::InitOnce(); });
+    display.driver.WaitUntilHeld("eglGetProcAddress");
+    std::thread second([] { EglFrameTimeImpl::InitOnce(); });
+
+    display.driver.Release("eglGetProcAddress");
+    first.join();
+    second.join();
+
+    EXPECT_TRUE(EglFrameTime::IsFrameTimestampSupported());
+    EXPECT_TRUE(Nib::IsPresentationTimeSupported());
+}
+
+TEST(EglFrameTime, NoTimesWithoutTheEntryPointOfTheFrameNumber)
+{
+    WindowDevice device;
+    device.driver.FailWhen("eglGetProcAddress", 0, "eglGetNextFrameIdANDROID", EGL_SUCCESS);
+
+    EXPECT_FALSE(EglFrameTime::IsFrameTimestampSupported());
+    EXPECT_EQ(NextFrame(), nullptr);
+
+    EXPECT_EQ(device.driver.CallCount("eglSurfaceAttrib"), 0u);
+    EXPECT_EQ(device.driver.LogTexts(ANDROID_LOG_ERROR).size(), 0u);
+}
+
+TEST(EglFrameTime, MissingEntryPointsOfTheTimesAreFailures)
+{
+    WindowDevice device;
+    device.driver.FailWhen("eglGetProcAddress", 0, "eglGetFrameTimestampsANDROID", EGL_SUCCESS);
+    device.driver.FailWhen("eglGetProcAddress", 0, "eglGetCompositorTimingANDROID", EGL_SUCCESS);
+    const std::unique_ptr<EglFrameTime> time = NextFrame();
+    ASSERT_NE(time, nullptr);
+
+    EXPECT_EQ(time->GetFrameTimestamp(Timestamp::ReadsDoneTime), 0);
+    EXPECT_EQ(time->GetCompositorTiming(Timing::CompositeInterval), 0);
+
+    EXPECT_EQ(device.driver.LogTexts(ANDROID_LOG_ERROR).size(), 2u);
+}
+
+TEST(EglFrameTime, VirtualOperationsStandInTheirOrder)
+{
+    // Both destructors of the ABI, then the five operations.
+    using AskTimestamp = bool (*)(const EglFrameTime*, Timestamp);
+    using AskTiming = bool (*)(const EglFrameTime*, Timing);
+    using GetTimestamp = EglTime (*)(const EglFrameTime*, Timestamp);
+    using GetTiming = EglTime (*)(const EglFrameTime*, Timing);
+    using SetTime = bool (*)(const EglFrameTime*, EglTime);
+    WindowDevice device;
+    const std::unique_ptr<EglFrameTime> time = NextFrame();
+    void* const* table = *reinterpret_cast<void* const* const*>(time.get());
+    device.driver.ForgetCalls();
+
+    reinterpret_cast<AskTimestamp>(table[2])(time.get(), Timestamp::ReadsDoneTime);
+    reinterpret_cast<AskTiming>(table[3])(time.get(), Timing::CompositeDeadline);
+    reinterpret_cast<GetTimestamp>(table[4])(time.get(), Timestamp::ReadsDoneTime);
+    reinterpret_cast<GetTiming>(table[5])(time.get(), Timing::CompositeDeadline);
+    reinterpret_cast<SetTime>(table[6])(time.get(), 1);
+
+    EXPECT_EQ(device.driver.CallNames(),
+              Names({"eglGetFrameTimestampSupportedANDROID",
+                     "eglGetCompositorTimingSupportedANDROID", "eglGetFrameTimestampsANDROID",
+                     "eglGetCompositorTimingANDROID", "eglPresentationTimeANDROID"}));
 }

@@ -448,3 +448,57 @@ TEST(EglSyncObject, FencesOfTwoThreadsAreTwo)
     EXPECT_FALSE(calls[0].args.at(1) == calls[1].args.at(1));
     device.driver.ReleaseGpu();
 }
+
+// ---- threads and slots --------------------------------------------------------------------------
+
+TEST(EglSyncObject, FirstCallsOfTwoThreadsAreHarmless)
+{
+    FenceDevice device;
+    device.driver.Hold("eglGetProcAddress");
+    std::thread first([] { EglSyncObjectImpl::InitOnce(); });
+    device.driver.WaitUntilHeld("eglGetProcAddress");
+    std::thread second([] { EglSyncObjectImpl::InitOnce(); });
+
+    device.driver.Release("eglGetProcAddress");
+    first.join();
+    second.join();
+
+    const std::unique_ptr<EglSyncObject> fence = NewFence();
+    ASSERT_NE(fence, nullptr);
+    EXPECT_EQ(fence->Wait(), Result::Passed);
+}
+
+TEST(EglSyncObject, FenceIsWaitedForAndEndedOnAnyThread)
+{
+    FenceDevice device;
+    std::unique_ptr<EglSyncObject> fence = NewFence();
+
+    std::thread other(
+        [&]
+        {
+            EXPECT_EQ(fence->Wait(), Result::Passed);
+            EXPECT_EQ(fence->GetState(), State::Signaled);
+            fence.reset();
+        });
+    other.join();
+
+    EXPECT_EQ(device.driver.Live().eglSyncs, 0);
+}
+
+TEST(EglSyncObject, VirtualOperationsStandInTheirOrder)
+{
+    // Both destructors of the ABI, then Wait, WaitTimeout and GetState.
+    using WaitSlot = Result (*)(const EglSyncObject*);
+    using TimeoutSlot = Result (*)(const EglSyncObject*, std::uint64_t);
+    using StateSlot = State (*)(const EglSyncObject*);
+    FenceDevice device;
+    const std::unique_ptr<EglSyncObject> fence = NewFence();
+    void* const* table = *reinterpret_cast<void* const* const*>(fence.get());
+
+    EXPECT_EQ(reinterpret_cast<WaitSlot>(table[2])(fence.get()), Result::Passed);
+    EXPECT_EQ(device.driver.LastCall("eglClientWaitSyncKHR").args.at(3),
+              SimValue(0xFFFFFFFFFFFFFFFFull));
+    EXPECT_EQ(reinterpret_cast<TimeoutSlot>(table[3])(fence.get(), 99), Result::Passed);
+    EXPECT_EQ(device.driver.LastCall("eglClientWaitSyncKHR").Arg(3), 99);
+    EXPECT_EQ(reinterpret_cast<StateSlot>(table[4])(fence.get()), State::Signaled);
+}
