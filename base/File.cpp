@@ -15,9 +15,11 @@ namespace Nib
 namespace
 {
 
-constexpr mode_t kFileMode = 0666; // before the process's mask
+// Before the process's mask.
+constexpr mode_t kFileMode = 0666;
+constexpr mode_t kPrivateFileMode = 0600;
 
-// The flags that fopen() would use for the mode; -1 for one that it does not know.
+// The flags that fopen() would use for the mode, with "n" and "p" besides; -1 for an unknown one.
 int OpenFlags(const char* mode)
 {
     int flags = O_CLOEXEC;
@@ -30,18 +32,20 @@ int OpenFlags(const char* mode)
     case 'a': flags |= write | O_CREAT | O_APPEND; break;
     default: return -1;
     }
-    if (mode[std::strspn(mode + 1, "+bex") + 1] != '\0')
+    if (mode[std::strspn(mode + 1, "+bexnp") + 1] != '\0')
         return -1;
     if (std::strchr(mode, 'x'))
         flags |= O_EXCL;
+    if (std::strchr(mode, 'n'))
+        flags |= O_NOFOLLOW;
     return flags;
 }
 
-int OpenRetrying(const char* path, int flags)
+int OpenRetrying(const char* path, int flags, mode_t permissions)
 {
     int descriptor = -1;
     do
-        descriptor = open(path, flags, kFileMode);
+        descriptor = open(path, flags, permissions);
     while (descriptor < 0 && errno == EINTR);
     return descriptor;
 }
@@ -87,7 +91,8 @@ bool File::Construct(const String* path, const char* mode, bool createParents)
     }
     if (createParents)
         MakeParentFolders(path->Get());
-    m_descriptor = OpenRetrying(path->Get(), flags);
+    m_descriptor =
+        OpenRetrying(path->Get(), flags, std::strchr(mode, 'p') ? kPrivateFileMode : kFileMode);
     return m_descriptor >= 0;
 }
 

@@ -2,6 +2,9 @@
 
 #include <zlib.h>
 
+#include <algorithm>
+#include <limits>
+
 namespace Nib
 {
 
@@ -45,16 +48,28 @@ BinaryShaderHeader MakeHeader(const ShaderProgramCache::BinaryShader& shader)
 
 std::uint64_t ContinueCrc(std::uint64_t crc, const void* data, std::size_t size)
 {
-    // A null pointer would start anew in zlib.
-    return size == 0 ? crc : crc32_z(crc, static_cast<const Bytef*>(data), size);
+    // In pieces that crc32() can count; the zlib of older devices has no crc32_z(). A null pointer
+    // would start anew in zlib, so no data is no call.
+    const auto* bytes = static_cast<const Bytef*>(data);
+    while (size != 0)
+    {
+        const auto piece =
+            static_cast<uInt>(std::min<std::size_t>(size, std::numeric_limits<uInt>::max()));
+        crc = crc32(static_cast<uLong>(crc), bytes, piece);
+        bytes += piece;
+        size -= piece;
+    }
+    return crc;
 }
 
 bool WriteBinaryShader(File& file, const ShaderProgramCache::BinaryShader& shader)
 {
+    if (shader.length < 0)
+        return false;
     const BinaryShaderHeader header = MakeHeader(shader);
     CheckedWriter writer(file);
     writer.Write(&header, sizeof header);
-    if (shader.length > 0)
+    if (shader.length != 0)
         writer.Write(shader.bytes, static_cast<std::size_t>(shader.length));
     for (const std::string& name : shader.attributes)
         writer.Write(name.c_str(), name.size() + 1);

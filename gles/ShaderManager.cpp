@@ -64,6 +64,7 @@ void ShaderManager::OnRestoreContext()
 {
     NIB_FUNCTION("void Nib::ShaderManager::OnRestoreContext()");
     NIB_LOG_INFO("%s", function);
+    void* const current = Key("").context;
     void* destroyed = nullptr;
     if (!TakeDestroyedContext(GetCurrentMsgQueue(), &destroyed))
         return;
@@ -77,7 +78,7 @@ void ShaderManager::OnRestoreContext()
             AutoCriticalSection guard(m_mapsLock);
             m_shaders.insert_or_assign(key, entry);
         }
-        NIB_LOG_INFO("%s Restore(%s, %p)", function, key.name.c_str(), key.context);
+        NIB_LOG_INFO("%s Restore(%s, %p)", function, key.name.c_str(), current);
     }
 }
 

@@ -18,12 +18,29 @@ namespace Nib
 namespace
 {
 
-/// A name beside @p path that no other thread or process uses.
+constexpr int kMostTemporaryNames = 16; ///< tried for one file
+
+/// A name beside @p path that no other thread uses.
 std::string TemporaryName(const std::string& path)
 {
     static std::atomic<unsigned> counter{0};
     return path + "." + std::to_string(getpid()) + "." +
            std::to_string(counter.fetch_add(1, std::memory_order_relaxed)) + ".tmp";
+}
+
+/// Opens a new file beside @p path, for this user alone, and gives its name in @p name. What an
+/// earlier process left under such a name, or somebody planted there, is passed over.
+bool OpenTemporary(File& file, const std::string& path, String& name)
+{
+    for (int i = 0; i < kMostTemporaryNames; ++i)
+    {
+        name.Construct(TemporaryName(path).c_str());
+        if (file.Construct(&name, "wbxnp", false))
+            return true;
+        if (errno != EEXIST)
+            break;
+    }
+    return false;
 }
 
 std::uint64_t CrcOfText(std::uint64_t crc, const char* text)
@@ -216,11 +233,10 @@ bool ShaderProgramCache::SaveToFile(const BinaryShader* shader)
     NIB_FUNCTION("bool Nib::ShaderProgramCache::SaveToFile(const "
                  "ShaderProgramCache::BinaryShader *)");
     const std::string path = GetFileName(shader->key);
-    const std::string temporary = TemporaryName(path); // so that no reader sees half a file
-    String temporaryPath;
-    temporaryPath.Construct(temporary.c_str());
+    String temporary; // so that no reader sees half a file
     File file;
-    if (!file.Construct(&temporaryPath, "wbx", false))
+    errno = ENOENT; // without a folder nothing is tried: the name would be one of the root's
+    if (m_cacheDirectory.empty() || !OpenTemporary(file, path, temporary))
     {
         NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
                       path.c_str());
@@ -231,15 +247,15 @@ bool ShaderProgramCache::SaveToFile(const BinaryShader* shader)
     if (!isWritten || !isClosed)
     {
         NIB_LOG_ERROR("%s filed to save file %s", function, path.c_str());
-        File::Unlink(&temporaryPath);
+        File::Unlink(&temporary);
         File::Unlink(path.c_str()); // what stands there is out of date
         return false;
     }
-    if (std::rename(temporary.c_str(), path.c_str()) != 0)
+    if (std::rename(temporary.Get(), path.c_str()) != 0)
     {
         NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
                       path.c_str());
-        File::Unlink(&temporaryPath);
+        File::Unlink(&temporary);
         return false;
     }
     return true;
@@ -254,7 +270,7 @@ ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderK
     String filePath;
     filePath.Construct(path);
     File file;
-    if (!file.Construct(&filePath, "rb", false))
+    if (!file.Construct(&filePath, "rbn", false))
     {
         NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
                       path);

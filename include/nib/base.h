@@ -267,8 +267,10 @@ public:
     File& operator=(const File&) = delete;
 
     /// Opens @p path as fopen() does for @p mode: "r", "w" or "a", with "+", "b", "x" or "e" behind
-    /// it. The file is never inherited by a program that the process starts. A file that this
-    /// object had open is closed. @p createParents makes the missing folders of the path first.
+    /// it, and two letters of its own: "n" refuses (ELOOP) a path whose last part is a symbolic
+    /// link, "p" makes a new file for this user alone (0600). The file is never inherited by a
+    /// program that the process starts. A file that this object had open is closed. @p
+    /// createParents makes the missing folders of the path first.
     bool Construct(const String* path, const char* mode, bool createParents);
 
     /// Reads up to @p count items of @p size bytes and returns how many came complete.
