@@ -99,7 +99,8 @@ protected:
         Owned<Nib::IShaderProgram> program(
             Nib::RendererFactory::CreateShaderProgram(vertex, fragment, nullptr));
         const bool saved = Integer(GL_NUM_PROGRAM_BINARY_FORMATS) > 0;
-        EXPECT_EQ(glGetError(), GLenum{saved ? GL_NO_ERROR : GL_INVALID_OPERATION});
+        const GLenum expected = saved ? GL_NO_ERROR : GL_INVALID_OPERATION;
+        EXPECT_EQ(glGetError(), expected);
         return program;
     }
 
