@@ -82,8 +82,7 @@ protected:
         OnThread(
             [&]
             {
-                const Owned<IShaderProgram> program(
-                    RendererFactory::CreateShaderProgram(kVertexShader, kFragmentShader, nullptr));
+                const auto program = MadeProgram(kVertexShader, kFragmentShader);
                 Page page(kSize, kSize);
                 program->Activate();
                 for (GLuint location = 0; location < 3; ++location)
