@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <atomic>
 #include <cerrno>
+#include <climits>
 #include <cstdio>
 #include <cstring>
 #include <utility>
@@ -41,6 +42,18 @@ bool OpenTemporary(File& file, const std::string& path, String& name)
             break;
     }
     return false;
+}
+
+// The number in the file may be one that no int holds; the line then shows all of it.
+void ReportAttributeCount(const char* function, std::uint64_t expected, std::size_t found)
+{
+    const int names = static_cast<int>(found);
+    if (expected <= INT_MAX)
+        NIB_LOG_ERROR("%s Filed to parse shader attributes. Expected=%d. Found = %d", function,
+                      static_cast<int>(expected), names);
+    else
+        NIB_LOG_ERROR("%s Filed to parse shader attributes. Expected=%lu. Found = %d", function,
+                      static_cast<unsigned long>(expected), names);
 }
 
 std::uint64_t CrcOfText(std::uint64_t crc, const char* text)
@@ -317,9 +330,7 @@ ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderK
             block.data(), static_cast<unsigned int>(block.size()), shader->attributes);
         if (!isParsed || shader->attributes.size() != header.attributeCount)
         {
-            NIB_LOG_ERROR("%s Filed to parse shader attributes. Expected=%d. Found = %d", function,
-                          static_cast<int>(header.attributeCount),
-                          static_cast<int>(shader->attributes.size()));
+            ReportAttributeCount(function, header.attributeCount, shader->attributes.size());
             return nullptr;
         }
     }

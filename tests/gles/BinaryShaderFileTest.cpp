@@ -411,8 +411,9 @@ TEST_F(BinaryShaderFile, WhoseAttributesAreOthersInNumberIsRefused)
     EXPECT_TRUE(IsRefused(fields, kLoad + "Filed to parse shader attributes. Expected=0. Found = "
                                           "2"));
     fields.attributeCount = 0x100000002;
-    EXPECT_TRUE(IsRefused(fields, kLoad + "Filed to parse shader attributes. Expected=2. Found = "
-                                          "2"));
+    EXPECT_TRUE(
+        IsRefused(fields, kLoad + "Filed to parse shader attributes. Expected=4294967298. Found = "
+                                  "2"));
 }
 
 TEST_F(BinaryShaderFile, WithoutItsWholeCrcIsRefused)
