@@ -1,6 +1,7 @@
 // Render threads that come and go leave nothing behind.
 
 #include "drivers/RenderThreadSupport.h"
+#include "drivers/ResidentMemory.h"
 #include "drivers/XWindow.h"
 
 #include <nib/egl.h>
@@ -101,18 +102,6 @@ int CountIn(const char* folder)
     for ([[maybe_unused]] const auto& entry : std::filesystem::directory_iterator(folder))
         ++count;
     return count;
-}
-
-long ResidentKiB()
-{
-    std::ifstream status("/proc/self/status");
-    std::string word;
-    while (status >> word && word != "VmRSS:")
-    {
-    }
-    long size = 0;
-    status >> size;
-    return size;
 }
 
 /// What a process holds that a leak would add to.
