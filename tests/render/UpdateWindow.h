@@ -85,6 +85,47 @@ struct UpdateWindow
     Nib::EglContext context;
 };
 
+/// Tiled rendering: mode 0x25.
+inline SimGpu TilingDevice()
+{
+    return SimGpu::Named("Adreno (TM) 530");
+}
+
+/// Tiled rendering on a GPU whose buffer ages are not to be trusted.
+inline SimGpu OldTilingDevice()
+{
+    return SimGpu::Named("Adreno (TM) 330");
+}
+
+/// Damage regions: mode 0x45.
+inline SimGpu DamageDevice()
+{
+    return SimGpu::Named("Mali-G72");
+}
+
+/// Tile alignment: mode 0x07.
+inline SimGpu TiledMali()
+{
+    return SimGpu::Named("Mali-T860");
+}
+
+/// None of it: mode 0x09.
+inline SimGpu PlainDevice()
+{
+    return SimGpu::Named("PowerVR Rogue GE8320");
+}
+
+/// The centre of the back buffer has this colour.
+inline void FillBackBuffer(float red, float green, float blue, float alpha)
+{
+    glClearColor(red, green, blue, alpha);
+    glClear(GL_COLOR_BUFFER_BIT);
+}
+
+inline const Nib::RectF kDirty(100, 200, 300, 260);
+inline const Box kDirtyBox(100, 1660, 200, 60); // on 1080 x 1920
+inline const Box kFullScreen(0, 0, 1080, 1920);
+
 /// A device whose back buffers have this age from the second frame on.
 inline SimGpu WithAge(const SimGpu& gpu, int age)
 {
