@@ -65,7 +65,7 @@ std::array<float, 4> Floats(const Color& color)
 }
 
 /// A small target on which a quad is blended over a clear colour.
-class BlendDriver : public ResourceContext
+class BlendOnDriver : public ResourceContext
 {
 protected:
     void SetUp() override
@@ -103,7 +103,7 @@ private:
 
 } // namespace
 
-TEST_F(BlendDriver, EveryPairOfFactorsGivesTheColorsOfItsEquation)
+TEST_F(BlendOnDriver, EveryPairOfFactorsGivesTheColorsOfItsEquation)
 {
     const Owned<IBlendStateObject> state(
         RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true)));
@@ -132,7 +132,7 @@ TEST_F(BlendDriver, EveryPairOfFactorsGivesTheColorsOfItsEquation)
     }
 }
 
-TEST_F(BlendDriver, EveryPairOfFunctionsGivesTheColorsOfItsEquation)
+TEST_F(BlendOnDriver, EveryPairOfFunctionsGivesTheColorsOfItsEquation)
 {
     const int source = 6;      // source alpha
     const int destination = 1; // one
@@ -159,7 +159,7 @@ TEST_F(BlendDriver, EveryPairOfFunctionsGivesTheColorsOfItsEquation)
     }
 }
 
-TEST_F(BlendDriver, TheDefaultBlendsPremultipliedColors)
+TEST_F(BlendOnDriver, TheDefaultBlendsPremultipliedColors)
 {
     const Owned<IBlendStateObject> state(
         RendererFactory::CreateBlendStateObject(BlendStateDescriptor(true)));
@@ -168,7 +168,7 @@ TEST_F(BlendDriver, TheDefaultBlendsPremultipliedColors)
     EXPECT_EQ(Draw(*state), (Pixel{143, 163, 71, 235}));
 }
 
-TEST_F(BlendDriver, WithoutBlendingTheSourceReplaces)
+TEST_F(BlendOnDriver, WithoutBlendingTheSourceReplaces)
 {
     const Owned<IBlendStateObject> state(
         RendererFactory::CreateBlendStateObject(BlendStateDescriptor(false)));
@@ -176,7 +176,7 @@ TEST_F(BlendDriver, WithoutBlendingTheSourceReplaces)
     EXPECT_EQ(Draw(*state), (Pixel{102, 153, 51, 204}));
 }
 
-TEST_F(BlendDriver, WithoutColorWritesNothingChanges)
+TEST_F(BlendOnDriver, WithoutColorWritesNothingChanges)
 {
     for (const bool enabled : {true, false})
     {
@@ -188,7 +188,7 @@ TEST_F(BlendDriver, WithoutColorWritesNothingChanges)
     glColorMask(GL_TRUE, GL_TRUE, GL_TRUE, GL_TRUE);
 }
 
-TEST_F(BlendDriver, TheScissorLimitsWhatIsCleared)
+TEST_F(BlendOnDriver, TheScissorLimitsWhatIsCleared)
 {
     IRasterizerState* const rasterizer = RendererFactory::GetRasterizerState();
     Target().ClearColor(1, 0, 0, 1);

@@ -35,9 +35,9 @@ Owned<IDepthStencilState> StencilState(DepthStencilFunction function, unsigned c
 
 } // namespace
 
-using RenderTargetDriver = ResourceContext;
+using RenderTargetOnDriver = ResourceContext;
 
-TEST_F(RenderTargetDriver, AnOffscreenTargetIsClearedToItsColor)
+TEST_F(RenderTargetOnDriver, AnOffscreenTargetIsClearedToItsColor)
 {
     const Owned<ITextureObject> texture = NewTexture(16, 8);
     const Owned<IOffscreenRenderTarget> target = NewTarget(texture.get());
@@ -48,7 +48,7 @@ TEST_F(RenderTargetDriver, AnOffscreenTargetIsClearedToItsColor)
     EXPECT_EQ(PixelOf(*target, 15, 7), (Pixel{51, 102, 153, 204}));
 }
 
-TEST_F(RenderTargetDriver, ActivationSetsFramebufferAndViewport)
+TEST_F(RenderTargetOnDriver, ActivationSetsFramebufferAndViewport)
 {
     const Owned<ITextureObject> texture = NewTexture(16, 8);
     const Owned<IOffscreenRenderTarget> target = NewTarget(texture.get());
@@ -61,7 +61,7 @@ TEST_F(RenderTargetDriver, ActivationSetsFramebufferAndViewport)
     EXPECT_EQ(FourIntegers(GL_VIEWPORT), (std::array<GLint, 4>{0, 0, 16, 8}));
 }
 
-TEST_F(RenderTargetDriver, ReadsARectangleIntoThePartOfMemoryThatIsDescribed)
+TEST_F(RenderTargetOnDriver, ReadsARectangleIntoThePartOfMemoryThatIsDescribed)
 {
     const Owned<ITextureObject> texture = NewTexture(16, 8);
     const Owned<IOffscreenRenderTarget> target = NewTarget(texture.get());
@@ -94,7 +94,7 @@ TEST_F(RenderTargetDriver, ReadsARectangleIntoThePartOfMemoryThatIsDescribed)
     EXPECT_EQ(Integer(GL_PACK_SKIP_PIXELS), 3);
 }
 
-TEST_F(RenderTargetDriver, TheNearerQuadStaysInFront)
+TEST_F(RenderTargetOnDriver, TheNearerQuadStaysInFront)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> depth = NewDepthStencil(8, 8);
@@ -111,7 +111,7 @@ TEST_F(RenderTargetDriver, TheNearerQuadStaysInFront)
     EXPECT_EQ(PixelOf(*target, 4, 4), kGreenPixel);
 }
 
-TEST_F(RenderTargetDriver, TheClearedDepthIsWhatIsComparedWith)
+TEST_F(RenderTargetOnDriver, TheClearedDepthIsWhatIsComparedWith)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> depth = NewDepthStencil(8, 8);
@@ -129,7 +129,7 @@ TEST_F(RenderTargetDriver, TheClearedDepthIsWhatIsComparedWith)
     EXPECT_EQ(PixelOf(*target, 6, 4), kBlack);
 }
 
-TEST_F(RenderTargetDriver, WithoutDepthWritesTheLaterQuadWins)
+TEST_F(RenderTargetOnDriver, WithoutDepthWritesTheLaterQuadWins)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> depth = NewDepthStencil(8, 8);
@@ -154,7 +154,7 @@ struct DepthRow
     bool above; ///< 0.75
 };
 
-TEST_F(RenderTargetDriver, EveryDepthFunctionComparesAsItsNameSays)
+TEST_F(RenderTargetOnDriver, EveryDepthFunctionComparesAsItsNameSays)
 {
     const DepthRow rows[] = {
         {DepthStencilFunction::Never, false, false, false},
@@ -191,7 +191,7 @@ TEST_F(RenderTargetDriver, EveryDepthFunctionComparesAsItsNameSays)
     glDepthMask(GL_TRUE);
 }
 
-TEST_F(RenderTargetDriver, StencilLimitsDrawingToWhatWasMarked)
+TEST_F(RenderTargetOnDriver, StencilLimitsDrawingToWhatWasMarked)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> stencil = NewDepthStencil(8, 8);
@@ -209,7 +209,7 @@ TEST_F(RenderTargetDriver, StencilLimitsDrawingToWhatWasMarked)
     EXPECT_EQ(PixelOf(*target, 6, 4), kBlack);
 }
 
-TEST_F(RenderTargetDriver, TheClearedStencilAndTheMasksAreWhatIsComparedWith)
+TEST_F(RenderTargetOnDriver, TheClearedStencilAndTheMasksAreWhatIsComparedWith)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> stencil = NewDepthStencil(8, 8);
@@ -234,7 +234,7 @@ TEST_F(RenderTargetDriver, TheClearedStencilAndTheMasksAreWhatIsComparedWith)
     StencilState(DepthStencilFunction::Always, 0, StencilOperation::Keep)->Activate();
 }
 
-TEST_F(RenderTargetDriver, ADetachedBufferNoLongerTestsDepth)
+TEST_F(RenderTargetOnDriver, ADetachedBufferNoLongerTestsDepth)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> depth = NewDepthStencil(8, 8);
@@ -249,7 +249,7 @@ TEST_F(RenderTargetDriver, ADetachedBufferNoLongerTestsDepth)
     EXPECT_EQ(PixelOf(*target, 4, 4), kGreenPixel);
 }
 
-TEST_F(RenderTargetDriver, ASecondBufferTakesThePlaceOfTheFirst)
+TEST_F(RenderTargetOnDriver, ASecondBufferTakesThePlaceOfTheFirst)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> first = NewDepthStencil(8, 8);
@@ -266,7 +266,7 @@ TEST_F(RenderTargetDriver, ASecondBufferTakesThePlaceOfTheFirst)
     EXPECT_EQ(PixelOf(*target, 4, 4), kGreenPixel);
 }
 
-TEST_F(RenderTargetDriver, ATextureThatCannotBeDrawnIntoThrows)
+TEST_F(RenderTargetOnDriver, ATextureThatCannotBeDrawnIntoThrows)
 {
     TextureDescriptor descriptor;
     descriptor.width = 8;
@@ -285,7 +285,7 @@ TEST_F(RenderTargetDriver, ATextureThatCannotBeDrawnIntoThrows)
     }
 }
 
-TEST_F(RenderTargetDriver, TheDefaultTargetIsTheSurface)
+TEST_F(RenderTargetOnDriver, TheDefaultTargetIsTheSurface)
 {
     const Owned<IRenderTarget> target(
         RendererFactory::CreateRenderTargetFromDefault(kWidth, kHeight));
@@ -296,7 +296,7 @@ TEST_F(RenderTargetDriver, TheDefaultTargetIsTheSurface)
     EXPECT_EQ(Integer(GL_FRAMEBUFFER_BINDING), 0);
 }
 
-TEST_F(RenderTargetDriver, TheCurrentTargetGoesBackToTheFramebufferItWasMadeOf)
+TEST_F(RenderTargetOnDriver, TheCurrentTargetGoesBackToTheFramebufferItWasMadeOf)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<ITextureObject> other = NewTexture(8, 8);
@@ -312,7 +312,7 @@ TEST_F(RenderTargetDriver, TheCurrentTargetGoesBackToTheFramebufferItWasMadeOf)
     EXPECT_EQ(PixelOf(*another, 4, 4), kRedPixel);
 }
 
-TEST_F(RenderTargetDriver, ADepthStencilBufferIsRebuiltAndServesANewTarget)
+TEST_F(RenderTargetOnDriver, ADepthStencilBufferIsRebuiltAndServesANewTarget)
 {
     const Owned<ITextureObject> texture = NewTexture(8, 8);
     const Owned<IDepthStencilBuffer> depth = NewDepthStencil(8, 8);

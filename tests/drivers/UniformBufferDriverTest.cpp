@@ -19,7 +19,7 @@ constexpr const char* kFragment = "#version 300 es\n"
                                   "void main() { o_color = first + second; }\n";
 
 /// A context of OpenGL ES 3, a program with a uniform block and a target to see its colours in.
-class UniformBufferDriver : public ResourceContext
+class UniformBufferOnDriver : public ResourceContext
 {
 protected:
     void SetUp() override
@@ -76,7 +76,7 @@ private:
 
 } // namespace
 
-TEST_F(UniformBufferDriver, AProgramReadsItsBlockFromTheBuffer)
+TEST_F(UniformBufferOnDriver, AProgramReadsItsBlockFromTheBuffer)
 {
     const Owned<IUniformBuffer> buffer = NewBuffer();
     const float colors[8] = {0.2f, 0.0f, 0.4f, 0.5f, 0.2f, 0.6f, 0.0f, 0.5f};
@@ -87,7 +87,7 @@ TEST_F(UniformBufferDriver, AProgramReadsItsBlockFromTheBuffer)
     EXPECT_EQ(Draw(2), (Pixel{102, 153, 102, 255}));
 }
 
-TEST_F(UniformBufferDriver, AnUpdateReplacesTheContents)
+TEST_F(UniformBufferOnDriver, AnUpdateReplacesTheContents)
 {
     const Owned<IUniformBuffer> buffer = NewBuffer();
     const float before[8] = {1, 1, 1, 1, 0, 0, 0, 0};
@@ -102,7 +102,7 @@ TEST_F(UniformBufferDriver, AnUpdateReplacesTheContents)
     EXPECT_EQ(Draw(0), (Pixel{0, 102, 0, 255}));
 }
 
-TEST_F(UniformBufferDriver, EveryBindingPointHasItsOwnBuffer)
+TEST_F(UniformBufferOnDriver, EveryBindingPointHasItsOwnBuffer)
 {
     std::vector<Owned<IUniformBuffer>> buffers;
     for (int i = 0; i < 4; ++i)
@@ -119,7 +119,7 @@ TEST_F(UniformBufferDriver, EveryBindingPointHasItsOwnBuffer)
     EXPECT_EQ(Draw(3), (Pixel{153, 0, 0, 255}));
 }
 
-TEST_F(UniformBufferDriver, MakingOneEmptiesTheArrayBufferThatIsBound)
+TEST_F(UniformBufferOnDriver, MakingOneEmptiesTheArrayBufferThatIsBound)
 {
     GLuint array = 0;
     glGenBuffers(1, &array);
@@ -134,9 +134,9 @@ TEST_F(UniformBufferDriver, MakingOneEmptiesTheArrayBufferThatIsBound)
     glDeleteBuffers(1, &array);
 }
 
-using FenceDriver = ResourceContext;
+using GpuFenceOnDriver = ResourceContext;
 
-TEST_F(FenceDriver, IsPassedOnceTheGpuIsDone)
+TEST_F(GpuFenceOnDriver, IsPassedOnceTheGpuIsDone)
 {
     const Owned<ITextureObject> texture = NewTexture(256, 256);
     const Owned<IOffscreenRenderTarget> target = NewTarget(texture.get());
@@ -152,7 +152,7 @@ TEST_F(FenceDriver, IsPassedOnceTheGpuIsDone)
     EXPECT_EQ(fence->Wait(0), IFence::Signaled);
 }
 
-TEST_F(FenceDriver, MayBeInsertedAgain)
+TEST_F(GpuFenceOnDriver, MayBeInsertedAgain)
 {
     const Owned<IFence> fence(RendererFactory::CreateFence());
     for (int i = 0; i < 3; ++i)
@@ -162,7 +162,7 @@ TEST_F(FenceDriver, MayBeInsertedAgain)
     }
 }
 
-TEST_F(FenceDriver, NeverInsertedItIsReleasedWithoutAnError)
+TEST_F(GpuFenceOnDriver, NeverInsertedItIsReleasedWithoutAnError)
 {
     Owned<IFence> fence(RendererFactory::CreateFence());
 
@@ -171,9 +171,9 @@ TEST_F(FenceDriver, NeverInsertedItIsReleasedWithoutAnError)
     EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
 }
 
-using ContextHolderDriver = ResourceContext;
+using ContextHolderOnDriver = ResourceContext;
 
-TEST_F(ContextHolderDriver, NamesTheCurrentContextAndItsVendor)
+TEST_F(ContextHolderOnDriver, NamesTheCurrentContextAndItsVendor)
 {
     IContextHolder* const holder = RendererFactory::GetContextHolder();
     const std::string vendor = reinterpret_cast<const char*>(glGetString(GL_VENDOR));
@@ -187,7 +187,7 @@ TEST_F(ContextHolderDriver, NamesTheCurrentContextAndItsVendor)
     holder->WaitForGpuCompletion();
 }
 
-TEST_F(ContextHolderDriver, TheTextureLimitIsTheDrivers)
+TEST_F(ContextHolderOnDriver, TheTextureLimitIsTheDrivers)
 {
     OpenGLRenderer::InitParameters();
 
