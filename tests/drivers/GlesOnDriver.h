@@ -94,7 +94,7 @@ private:
         const std::filesystem::path m_path = Make();
     };
 
-    const TemporaryFolder m_folder;
+    TemporaryFolder m_folder;
 
     static void On(Nib::RenderThreadGL& renderer, const std::function<void()>& function)
     {
