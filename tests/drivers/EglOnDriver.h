@@ -20,6 +20,15 @@ inline bool IsSurfaceless()
     return platform != nullptr && std::string_view(platform) == "surfaceless";
 }
 
+/// Whether surfaces of the library's configuration may keep their content across swaps.
+inline bool CanPreserve()
+{
+    const Nib::Egl* egl = Nib::Egl::GetInstance();
+    EGLint types = 0;
+    eglGetConfigAttrib(egl->GetDisplay(), egl->GetConfig(false), EGL_SURFACE_TYPE, &types);
+    return (types & EGL_SWAP_BEHAVIOR_PRESERVED_BIT) != 0;
+}
+
 /// The library's own EGL objects, on whatever driver the process has loaded. Skipped where the
 /// driver has nowhere to draw.
 class EglOnDriver : public testing::Test

@@ -28,11 +28,35 @@ protected:
         ASSERT_TRUE(Egl::GetInstance()->MakeCurrent(&m_context, m_surface.GetActiveSurface()));
     }
 
+    static bool TellsAges()
+    {
+        return Egl::GetInstance()->IsEglExtensionSupported("EGL_EXT_buffer_age");
+    }
+
+    /// Restricts drawing to what @p update makes of @p dirty.
+    static void ScissorTo(UpdateRectangle& update, const RectF& dirty)
+    {
+        int x = -1;
+        int y = -1;
+        int width = -1;
+        int height = -1;
+        update.UseRect(dirty, 0);
+        update.GetScissorRect(dirty, &x, &y, &width, &height, 0);
+        glEnable(GL_SCISSOR_TEST);
+        glScissor(x, y, width, height);
+    }
+
+    static void Present(UpdateRectangle& update)
+    {
+        update.Reset();
+        EXPECT_TRUE(update.DoSwapBuffers());
+    }
+
     EglContext m_context;
     HybridSurface m_surface;
 };
 
-TEST_F(UpdateRectangleOnDriver, WindowKeepsItsContent)
+TEST_F(UpdateRectangleOnDriver, WindowKeepsItsContentWhereItCan)
 {
     if (IsSurfaceless())
         GTEST_SKIP() << "this display has no windows";
@@ -42,7 +66,7 @@ TEST_F(UpdateRectangleOnDriver, WindowKeepsItsContent)
 
     update.Init(m_surface.GetActiveSurface());
 
-    EXPECT_EQ(update.GetUpdateMode(), 0x09u);
+    EXPECT_EQ(update.GetUpdateMode(), CanPreserve() ? 0x09u : 0x01u);
     EXPECT_EQ(update.GetTileSize(), 0);
     EXPECT_EQ(update.GetScreenWidth(), 64);
     EXPECT_EQ(update.GetScreenHeight(), 48);
@@ -52,6 +76,8 @@ TEST_F(UpdateRectangleOnDriver, SecondFrameChangesOnlyWhatItDraws)
 {
     if (IsSurfaceless())
         GTEST_SKIP() << "this display has no windows";
+    if (!CanPreserve())
+        GTEST_SKIP() << "windows lose their content in a swap";
     XWindow window(64, 48);
     ASSERT_NO_FATAL_FAILURE(Attach(window));
     UpdateRectangle update;
@@ -59,26 +85,17 @@ TEST_F(UpdateRectangleOnDriver, SecondFrameChangesOnlyWhatItDraws)
 
     // Given a green frame
     Clear(0.0f, 1.0f, 0.0f, 1.0f);
-    update.Reset();
-    EXPECT_TRUE(update.DoSwapBuffers());
+    Present(update);
 
-    // When the next one draws 8 x 8 red pixels at the top left of the window
-    int x = -1;
-    int y = -1;
-    int width = -1;
-    int height = -1;
-    update.UseRect(RectF(0, 0, 8, 8), 0);
-    update.GetScissorRect(RectF(0, 0, 8, 8), &x, &y, &width, &height, 0);
-    EXPECT_EQ(x, 0);
-    EXPECT_EQ(y, 40);
-    EXPECT_EQ(width, 8);
-    EXPECT_EQ(height, 8);
-    glEnable(GL_SCISSOR_TEST);
-    glScissor(x, y, width, height);
-    Clear(1.0f, 0.0f, 0.0f, 1.0f);
-    glDisable(GL_SCISSOR_TEST);
-    update.Reset();
-    EXPECT_TRUE(update.DoSwapBuffers());
+    // When the next ones draw 8 x 8 red pixels at the top left of the window; two, because softpipe
+    // shows one that is only a clear with the next
+    for (int i = 0; i < 2; ++i)
+    {
+        ScissorTo(update, RectF(0, 0, 8, 8));
+        Clear(1.0f, 0.0f, 0.0f, 1.0f);
+        glDisable(GL_SCISSOR_TEST);
+        Present(update);
+    }
 
     // Then the rest is still green
     EXPECT_TRUE(Near(window.AtOnceNear(4, 4, {255, 0, 0}), {255, 0, 0}));
@@ -87,16 +104,39 @@ TEST_F(UpdateRectangleOnDriver, SecondFrameChangesOnlyWhatItDraws)
     EXPECT_EQ(glGetError(), GLenum{GL_NO_ERROR});
 }
 
+TEST_F(UpdateRectangleOnDriver, ScissorBoxIsExactWhereTheContentIsKnown)
+{
+    if (IsSurfaceless())
+        GTEST_SKIP() << "this display has no windows";
+    if (TellsAges())
+        GTEST_SKIP() << "the age of a new buffer is 0";
+    XWindow window(64, 48);
+    ASSERT_NO_FATAL_FAILURE(Attach(window));
+    UpdateRectangle update;
+    update.Init(m_surface.GetActiveSurface());
+    Clear(0.0f, 1.0f, 0.0f, 1.0f);
+
+    ScissorTo(update, RectF(0, 0, 8, 8));
+
+    GLint box[4] = {};
+    glGetIntegerv(GL_SCISSOR_BOX, box);
+    EXPECT_EQ(box[0], 0);
+    EXPECT_EQ(box[1], 40);
+    EXPECT_EQ(box[2], 8);
+    EXPECT_EQ(box[3], 8);
+}
+
 TEST_F(UpdateRectangleOnDriver, NewBufferIsDirtyUntilItsCentreIsDrawn)
 {
     if (IsSurfaceless())
         GTEST_SKIP() << "this display has no windows";
+    if (TellsAges())
+        GTEST_SKIP() << "the age of a buffer decides, not its centre";
     XWindow window(64, 48);
     ASSERT_NO_FATAL_FAILURE(Attach(window));
     UpdateRectangle update;
     update.Init(m_surface.GetActiveSurface());
 
-    // This driver does not tell the age of a buffer, so that its centre decides.
     Clear(0.0f, 0.0f, 0.0f, 0.0f);
     EXPECT_TRUE(update.IsFramebufferDirty());
 
@@ -104,7 +144,28 @@ TEST_F(UpdateRectangleOnDriver, NewBufferIsDirtyUntilItsCentreIsDrawn)
     EXPECT_FALSE(update.IsFramebufferDirty());
 }
 
-TEST_F(UpdateRectangleOnDriver, PbufferIsUpdatedOnceAWay)
+TEST_F(UpdateRectangleOnDriver, NewBufferIsDirtyByItsAge)
+{
+    if (IsSurfaceless())
+        GTEST_SKIP() << "this display has no windows";
+    if (!TellsAges())
+        GTEST_SKIP() << "this driver does not tell the age of a buffer";
+    XWindow window(64, 48);
+    ASSERT_NO_FATAL_FAILURE(Attach(window));
+    UpdateRectangle update;
+    update.Init(m_surface.GetActiveSurface());
+
+    Clear(0.0f, 0.0f, 0.0f, 1.0f);
+
+    EXPECT_TRUE(update.IsFramebufferDirty());
+    ScissorTo(update, RectF(0, 0, 8, 8));
+    GLint box[4] = {};
+    glGetIntegerv(GL_SCISSOR_BOX, box);
+    EXPECT_EQ(box[2], 64);
+    EXPECT_EQ(box[3], 48);
+}
+
+TEST_F(UpdateRectangleOnDriver, PbufferIsPresentedToo)
 {
     if (!IsSurfaceless())
         GTEST_SKIP() << "this display has windows";
@@ -116,8 +177,7 @@ TEST_F(UpdateRectangleOnDriver, PbufferIsUpdatedOnceAWay)
     EXPECT_EQ(update.GetScreenWidth(), 1);
     Clear(0.0f, 0.0f, 1.0f, 1.0f);
     update.UseRect(RectF(0, 0, 1, 1), 0);
-    update.Reset();
-    EXPECT_TRUE(update.DoSwapBuffers());
+    Present(update);
     EXPECT_EQ(PixelAt(0, 0), (Rgba{0, 0, 255, 255}));
 }
 
