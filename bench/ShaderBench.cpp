@@ -5,20 +5,13 @@
 // Every iteration that compiles or reads a file has a source of its own, told apart by a comment,
 // so that neither this cache nor the driver's knows it.
 
-#include <nib/msg_queue.h>
-#include <nib/render_thread.h>
-#include <nib/renderer_factory.h>
+#include "BenchThread.h"
+
 #include <nib/shader_cache.h>
-#include <nib/task.h>
 
 #include <GLES3/gl3.h>
 
-#include <benchmark/benchmark.h>
-
-#include <cstdio>
-#include <cstdlib>
 #include <filesystem>
-#include <memory>
 #include <string>
 #include <vector>
 
@@ -166,39 +159,9 @@ void BM_ProgramFromSource(benchmark::State& state)
 }
 BENCHMARK(BM_ProgramFromSource)->Iterations(kPrograms);
 
-class BenchmarkTask : public ITask
-{
-public:
-    void run() override { benchmark::RunSpecifiedBenchmarks(); }
-};
-
 } // namespace
 
 int main(int argc, char** argv)
 {
-    std::string folder = (fs::temp_directory_path() / "nib-bench-XXXXXX").string();
-    if (!mkdtemp(folder.data()))
-        return 1;
-    System::SetSDKCacheDirectoryPath((folder + "/sdk").c_str());
-    setenv("MESA_SHADER_CACHE_DIR", (folder + "/driver").c_str(), 1);
-    setenv("NIB_LOG", "silent", 0);
-    if (!std::getenv("DISPLAY"))
-        setenv("EGL_PLATFORM", "surfaceless", 0);
-    benchmark::Initialize(&argc, argv);
-
-    std::unique_ptr<RenderThreadGL> thread(
-        GLES::CreateSurfaceRenderer("bench", RenderThreadGL::Medium));
-    const bool started = thread->Start();
-    if (started)
-    {
-        thread->GetMsgQueue()->enQueueMsg(new BenchmarkTask);
-        thread->GetMsgQueue()->waitForCompleting();
-    }
-    else
-    {
-        std::fprintf(stderr, "the driver does not start\n");
-    }
-    thread.reset();
-    fs::remove_all(folder);
-    return started ? 0 : 1;
+    return RunBenchmarksOnRenderThread(argc, argv);
 }
