@@ -1,499 +1,558 @@
 #include "sim/SimDriver.h"
-#include "thread/Tasks.h"
-#include "thread/WorkerThreadImpl.h"
-
-#include <nib/base.h>
-#include <nib/msg_queue.h>
+#include "thread/ThreadTestSupport.h"
 
 #include <gtest/gtest.h>
 
-#include <atomic>
+#include <cerrno>
+#include <cstring>
+#include <stdexcept>
 #include <string>
-#include <thread>
-#include <vector>
 
-using Nib::IWorkerThread;
-using Texts = std::vector<std::string>;
+#include <sys/resource.h>
+
+using namespace Nib;
 
 namespace
 {
 
-/// Appends to a list that only the worker touches until the test has waited for it.
-struct Notes
-{
-    Texts texts;
-    Nib::ITask* Task(std::string text)
-    {
-        return new LambdaTask([this, text] { texts.push_back(text); },
-                              [this, text] { texts.push_back("end of " + text); });
-    }
-};
-
-/// Tells when tasks have been queued; carriers of synchronous tasks come through here, too.
-class WatchedWorker : public Nib::WorkerThreadImpl
-{
-public:
-    WatchedWorker() : WorkerThreadImpl("watched", 0, false) {}
-
-    bool EnqueueAsyncTask(Nib::ITask* task) override
-    {
-        const bool taken = WorkerThreadImpl::EnqueueAsyncTask(task);
-        const std::lock_guard lock(m_mutex);
-        ++m_queued;
-        m_changed.notify_all();
-        return taken;
-    }
-    void WaitUntilQueued(int count)
-    {
-        std::unique_lock lock(m_mutex);
-        m_changed.wait(lock, [&] { return m_queued >= count; });
-    }
-
-private:
-    std::mutex m_mutex;
-    std::condition_variable m_changed;
-    int m_queued = 0;
-};
-
 class WorkerThread : public testing::Test
 {
 protected:
-    SimDriver driver; // for its log
-    Worker worker = MakeWorker();
+    static std::unique_ptr<IWorkerThread> NewWorker()
+    {
+        return std::unique_ptr<IWorkerThread>(IWorkerThread::CreateInstance_NoLock("worker", 0));
+    }
+
+    /// Runs @p function on the worker, ahead of its queue.
+    static void RunAhead(IWorkerThread& worker, std::function<void()> function)
+    {
+        worker.RunSyncTask(new CallTask(std::move(function)), kAheadOfQueue, kDeleteAfterRun);
+    }
+
+    void Enqueue(std::initializer_list<int> entries)
+    {
+        for (const int entry : entries)
+            EXPECT_TRUE(worker->EnqueueAsyncTask(record.NewTask(entry)));
+    }
+
+    SimDriver driver;
+    Record record;
+    std::unique_ptr<IWorkerThread> worker = NewWorker();
 };
+
+template <typename F>
+std::ptrdiff_t Slot(F function)
+{
+    std::ptrdiff_t parts[2] = {};
+    static_assert(sizeof function == sizeof parts);
+    std::memcpy(parts, &function, sizeof parts);
+    return (parts[0] & ~std::ptrdiff_t(1)) / static_cast<std::ptrdiff_t>(sizeof(void*));
+}
 
 } // namespace
 
-// ---- making, starting, ending -------------------------------------------------------------------
+TEST_F(WorkerThread, OperationsStandInTheExportedOrder)
+{
+    // Slots 0 and 1 are the destructor's.
+    EXPECT_EQ(Slot(&IWorkerThread::Start), 2);
+    EXPECT_EQ(Slot(&IWorkerThread::Terminate), 3);
+    EXPECT_EQ(Slot(&IWorkerThread::Pause), 4);
+    EXPECT_EQ(Slot(&IWorkerThread::Resume), 5);
+    EXPECT_EQ(Slot(&IWorkerThread::EnqueueAsyncTask), 6);
+    EXPECT_EQ(Slot(&IWorkerThread::IsRunning), 7);
+    EXPECT_EQ(Slot(&IWorkerThread::IsStarted), 8);
+    EXPECT_EQ(Slot(&IWorkerThread::WaitForExecution), 9);
+    EXPECT_EQ(Slot(&IWorkerThread::RunSyncTask), 10);
+}
 
-TEST_F(WorkerThread, IsMadePausedAndWithoutThread)
+// ---- start and end ----
+
+TEST_F(WorkerThread, IsMadeNeitherStartedNorRunning)
 {
     EXPECT_FALSE(worker->IsStarted());
     EXPECT_FALSE(worker->IsRunning());
-    EXPECT_EQ(driver.CallCount("pthread_create"), 0u);
-    EXPECT_TRUE(driver.HasLog(ANDROID_LOG_INFO,
-                              "Nib::WorkerThreadImpl::WorkerThreadImpl(const char *, "
-                              "Thread::ThreadPriority, bool) Initialize"));
 }
 
-TEST_F(WorkerThread, StartRunsAndLogs)
+TEST_F(WorkerThread, StartsRunning)
 {
     EXPECT_TRUE(worker->Start(!kPaused));
     EXPECT_TRUE(worker->IsStarted());
     EXPECT_TRUE(worker->IsRunning());
-    EXPECT_TRUE(driver.HasLog(ANDROID_LOG_INFO,
-                              "virtual bool Nib::WorkerThreadImpl::Start(bool) Starting"));
 }
 
-TEST_F(WorkerThread, StartOfAStartedOneChangesNothing)
+TEST_F(WorkerThread, StartsPaused)
 {
-    worker->Start(!kPaused);
     EXPECT_TRUE(worker->Start(kPaused));
-    EXPECT_TRUE(worker->IsRunning());
-    EXPECT_EQ(driver.CountLogContaining("Starting"), 2u);
-}
-
-TEST_F(WorkerThread, StartedPausedIsStartedButNotRunning)
-{
-    worker->Start(kPaused);
     EXPECT_TRUE(worker->IsStarted());
     EXPECT_FALSE(worker->IsRunning());
     worker->Resume();
 }
 
-TEST_F(WorkerThread, EndIsLoggedAndTerminates)
+TEST_F(WorkerThread, StartingAgainChangesNothing)
 {
-    worker->Start(!kPaused);
-    Notes notes;
-    worker->EnqueueAsyncTask(notes.Task("a"));
-    worker.reset();
-    EXPECT_EQ(notes.texts, (Texts{"a", "end of a"}));
-    EXPECT_TRUE(driver.HasLog(ANDROID_LOG_INFO,
-                              "virtual Nib::WorkerThreadImpl::~WorkerThreadImpl() Cleanup"));
-}
+    ASSERT_TRUE(worker->Start(!kPaused));
+    EXPECT_TRUE(worker->Start(kPaused));
+    EXPECT_TRUE(worker->IsRunning());
 
-TEST_F(WorkerThread, TerminateRunsEverythingQueuedBefore)
-{
-    worker->Start(!kPaused);
-    Gate gate;
-    worker->EnqueueAsyncTask(gate.Task());
-    Notes notes;
-    for (const char* name : {"a", "b", "c"})
-        worker->EnqueueAsyncTask(notes.Task(name));
-    gate.Open();
-    worker->Terminate();
-    EXPECT_EQ(notes.texts, (Texts{"a", "end of a", "b", "end of b", "c", "end of c"}));
-    EXPECT_FALSE(worker->IsStarted());
-}
-
-TEST_F(WorkerThread, SecondTerminateDoesNothing)
-{
-    worker->Terminate();
-    worker->Start(!kPaused);
-    worker->Terminate();
-    worker->Terminate();
-    EXPECT_FALSE(worker->IsStarted());
-}
-
-TEST_F(WorkerThread, CanBeStartedAgain)
-{
-    for (int round = 0; round < 3; ++round)
-    {
-        worker->Start(!kPaused);
-        bool ran = false;
-        LambdaTask task([&ran] { ran = true; });
-        worker->RunSyncTask(&task, !kAheadOfQueue, !kDeleteAfterRun);
-        EXPECT_TRUE(ran);
-        worker->Terminate();
-    }
-}
-
-TEST_F(WorkerThread, PausedKeepsItsValueThroughTermination)
-{
-    worker->Start(!kPaused);
-    worker->Terminate();
-    EXPECT_FALSE(worker->Resume()); // not paused
+    worker->Pause();
+    EXPECT_TRUE(worker->Start(!kPaused));
     EXPECT_FALSE(worker->IsRunning());
+    worker->Resume();
 }
 
-TEST(WatchedWorkerThread, TasksBehindTheLastOneRunAfterTheNextStart)
+TEST_F(WorkerThread, LogsItsLife)
 {
-    SimDriver driver;
-    WatchedWorker worker;
-    worker.Start(!kPaused);
-    Notes notes;
-    Gate gate;
-    worker.EnqueueAsyncTask(gate.Task());
-    std::thread terminator([&] { worker.Terminate(); });
-    worker.WaitUntilQueued(2); // the gate's task and the one that ends the worker
-    worker.EnqueueAsyncTask(notes.Task("late"));
-    gate.Open();
-    terminator.join();
-    EXPECT_TRUE(notes.texts.empty());
+    driver.ForgetLog();
+    auto logged = NewWorker();
+    logged->Start(!kPaused);
+    logged->Terminate();
+    logged.reset();
 
-    worker.Start(!kPaused);
-    EXPECT_TRUE(worker.WaitForExecution(nullptr));
-    EXPECT_EQ(notes.texts, (Texts{"late", "end of late"}));
-    worker.Terminate();
+    EXPECT_EQ(driver.LogTexts(ANDROID_LOG_INFO),
+              (std::vector<std::string>{
+                  "Nib::WorkerThreadImpl::WorkerThreadImpl(const char *, Thread::ThreadPriority, "
+                  "bool) Initialize",
+                  "virtual bool Nib::WorkerThreadImpl::Start(bool) Starting",
+                  "virtual Nib::WorkerThreadImpl::~WorkerThreadImpl() Cleanup"}));
+    EXPECT_EQ(driver.Log().size(), 3u);
+    EXPECT_EQ(driver.Log().front().tag, "nib_log");
 }
 
-TEST_F(WorkerThread, TasksQueuedBeforeTheStartRun)
+TEST_F(WorkerThread, EveryStartIsLogged)
 {
-    Notes notes;
-    worker->EnqueueAsyncTask(notes.Task("a"));
-    worker->EnqueueAsyncTask(notes.Task("b"));
-    EXPECT_TRUE(notes.texts.empty());
     worker->Start(!kPaused);
-    EXPECT_TRUE(worker->WaitForExecution(nullptr));
-    EXPECT_EQ(notes.texts, (Texts{"a", "end of a", "b", "end of b"}));
+    driver.ForgetLog();
+    worker->Start(!kPaused);
+    EXPECT_EQ(
+        driver.LogTexts(ANDROID_LOG_INFO),
+        (std::vector<std::string>{"virtual bool Nib::WorkerThreadImpl::Start(bool) Starting"}));
 }
 
-TEST_F(WorkerThread, TasksLeftInADestroyedQueueAreNeitherRunNorDeleted)
+TEST_F(WorkerThread, AThreadThatDoesNotStartIsReported)
 {
-    Notes notes;
-    const std::unique_ptr<Nib::ITask> task(notes.Task("a"));
-    worker->EnqueueAsyncTask(task.get());
-    worker.reset();
-    EXPECT_TRUE(notes.texts.empty());
-}
-
-TEST_F(WorkerThread, FailedStartIsLoggedAndLeavesItAsMade)
-{
+    driver.ForgetLog();
     driver.FailNext("pthread_create", EAGAIN);
+
     EXPECT_FALSE(worker->Start(!kPaused));
+
     EXPECT_FALSE(worker->IsStarted());
     EXPECT_FALSE(worker->IsRunning());
     EXPECT_EQ(driver.LogTexts(ANDROID_LOG_ERROR),
-              (Texts{"virtual bool Nib::WorkerThreadImpl::Start(bool): Failed to start thrtead"}));
-    EXPECT_FALSE(worker->Resume()); // the argument was stored already
-    EXPECT_TRUE(worker->Start(!kPaused));
+              (std::vector<std::string>{
+                  "virtual bool Nib::WorkerThreadImpl::Start(bool): Failed to start thrtead"}));
 }
 
-// ---- asynchronous tasks -------------------------------------------------------------------------
+TEST_F(WorkerThread, StartsAfterAFailure)
+{
+    Enqueue({1});
+    driver.FailNext("pthread_create", EAGAIN);
+    EXPECT_FALSE(worker->Start(!kPaused));
+    EXPECT_TRUE(worker->Start(!kPaused));
+    EXPECT_TRUE(worker->WaitForExecution(nullptr));
+    EXPECT_EQ(record.Entries(), Numbers({1}));
+}
 
-TEST_F(WorkerThread, AsyncTasksRunInOrderOnItsThreadAndAreDeleted)
+TEST_F(WorkerThread, AFailedStartKeepsItsPausedFlag)
+{
+    driver.FailNext("pthread_create", EAGAIN);
+    EXPECT_FALSE(worker->Start(!kPaused));
+    EXPECT_FALSE(worker->Resume()); // not paused any more
+}
+
+TEST_F(WorkerThread, CarriesItsNameAndPriority)
+{
+    char name[] = "?nk";
+    const std::unique_ptr<IWorkerThread> named(IWorkerThread::CreateInstance_NoLock(name, 7));
+    name[0] = 'i'; // the caller's text, not a copy
+    named->Start(!kPaused);
+
+    char shown[16] = {};
+    int nice = 0;
+    RunAhead(*named,
+             [&]
+             {
+                 pthread_getname_np(pthread_self(), shown, sizeof shown);
+                 nice = getpriority(PRIO_PROCESS, 0);
+             });
+
+    EXPECT_STREQ(shown, "ink");
+    EXPECT_EQ(nice, 7);
+}
+
+TEST_F(WorkerThread, TerminateRunsWhatIsQueued)
 {
     worker->Start(!kPaused);
-    Notes notes;
-    EXPECT_TRUE(worker->EnqueueAsyncTask(notes.Task("a")));
-    EXPECT_TRUE(worker->EnqueueAsyncTask(notes.Task("b")));
-    std::thread::id thread;
-    worker->EnqueueAsyncTask(new LambdaTask([&] { thread = std::this_thread::get_id(); }));
-    worker->WaitForExecution(nullptr);
-    EXPECT_EQ(notes.texts, (Texts{"a", "end of a", "b", "end of b"}));
-    EXPECT_NE(thread, std::this_thread::get_id());
-    EXPECT_NE(thread, std::thread::id());
+    {
+        Gate gate(*worker);
+        Enqueue({1, 2, 3});
+    }
+    worker->Terminate();
+    EXPECT_EQ(record.Entries(), Numbers({1, 2, 3}));
+    EXPECT_FALSE(worker->IsStarted());
+    EXPECT_FALSE(worker->IsRunning());
+}
+
+TEST_F(WorkerThread, TerminatingTwiceOrUnstartedDoesNothing)
+{
+    worker->Terminate();
+    EXPECT_FALSE(worker->IsStarted());
+    worker->Start(!kPaused);
+    worker->Terminate();
+    worker->Terminate();
+    EXPECT_FALSE(worker->IsStarted());
+}
+
+TEST_F(WorkerThread, StartsAgainAfterTerminate)
+{
+    for (int round = 0; round < 3; ++round)
+    {
+        EXPECT_TRUE(worker->Start(!kPaused));
+        Enqueue({round});
+        worker->Terminate();
+    }
+    EXPECT_EQ(record.Entries(), Numbers({0, 1, 2}));
+}
+
+TEST_F(WorkerThread, TerminateKeepsThePausedFlag)
+{
+    worker->Start(!kPaused);
+    worker->Terminate();
+    EXPECT_FALSE(worker->Resume()); // it is not paused
+}
+
+TEST_F(WorkerThread, DestructionTerminates)
+{
+    worker->Start(!kPaused);
+    {
+        Gate gate(*worker);
+        Enqueue({1, 2});
+    }
+    worker.reset();
+    EXPECT_EQ(record.Entries(), Numbers({1, 2}));
+}
+
+TEST_F(WorkerThread, TasksBehindTheLastOneStayForTheNextStart)
+{
+    FollowedWorker followed;
+    std::atomic<int> deleted{0};
+    followed.Start(!kPaused);
+    Event allQueued; // until then the worker does not reach the terminate task
+    followed.EnqueueQuietly(new CallTask([&] { allQueued.Wait(); }));
+    followed.onEnqueue = [&] // the terminate task is in the queue
+    {
+        followed.EnqueueQuietly(new CallTask([&] { record.Add(1); }, &deleted));
+        followed.EnqueueQuietly(new CallTask([&] { record.Add(2); }, &deleted));
+        allQueued.Set();
+    };
+
+    followed.Terminate();
+
+    EXPECT_EQ(record.Entries(), Numbers({}));
+    EXPECT_EQ(deleted.load(), 0);
+
+    followed.Start(!kPaused);
+    followed.Terminate(); // works, although nobody posts anything
+    EXPECT_EQ(record.Entries(), Numbers({1, 2}));
+    EXPECT_EQ(deleted.load(), 2);
+}
+
+TEST_F(WorkerThread, TasksLeftBehindAreCountedAgain)
+{
+    FollowedWorker followed;
+    followed.Start(!kPaused);
+    Event allQueued;
+    followed.EnqueueQuietly(new CallTask([&] { allQueued.Wait(); }));
+    followed.onEnqueue = [&]
+    {
+        followed.EnqueueQuietly(record.NewTask(1));
+        allQueued.Set();
+    };
+    followed.Terminate();
+    driver.ForgetLog();
+
+    EXPECT_FALSE(followed.WaitForExecution(nullptr));
+    followed.Start(kPaused);
+    EXPECT_FALSE(followed.WaitForExecution(nullptr));
+
+    EXPECT_EQ(driver.LogTexts(ANDROID_LOG_ERROR),
+              (std::vector<std::string>{
+                  "virtual bool Nib::WorkerThreadImpl::WaitForExecution(int *). Worker is on pause "
+                  "(Queued task: 0). No task executed.",
+                  "virtual bool Nib::WorkerThreadImpl::WaitForExecution(int *). Worker is on pause "
+                  "(Queued task: 1). No task executed."}));
+    followed.Resume();
+    followed.Terminate();
+    EXPECT_EQ(record.Entries(), Numbers({1}));
+}
+
+TEST_F(WorkerThread, TasksOfADestroyedWorkerAreNeitherRunNorDeleted)
+{
+    std::atomic<int> deleted{0};
+    ITask* const task = new CallTask([&] { record.Add(1); }, &deleted);
+    worker->EnqueueAsyncTask(task);
+    worker.reset();
+    EXPECT_EQ(record.Entries(), Numbers({}));
+    EXPECT_EQ(deleted.load(), 0);
+    delete task; // nobody else does
+}
+
+// ---- asynchronous tasks ----
+
+TEST_F(WorkerThread, RunsTasksInOrderOnItsOwnThread)
+{
+    worker->Start(!kPaused);
+    std::vector<Thread::Handle> threads;
+    std::atomic<int> deleted{0};
+    for (int i = 0; i < 5; ++i)
+    {
+        EXPECT_TRUE(worker->EnqueueAsyncTask(new CallTask(
+            [&, i]
+            {
+                record.Add(i);
+                threads.push_back(Thread::self());
+            },
+            &deleted)));
+    }
+    EXPECT_TRUE(worker->WaitForExecution(nullptr));
+
+    EXPECT_EQ(record.Entries(), Numbers({0, 1, 2, 3, 4}));
+    ASSERT_EQ(threads.size(), 5u);
+    for (const Thread::Handle thread : threads)
+    {
+        EXPECT_EQ(thread, threads.front());
+        EXPECT_NE(thread, Thread::self());
+    }
+    EXPECT_EQ(deleted.load(), 5);
+}
+
+TEST_F(WorkerThread, TakesTasksBeforeItIsStarted)
+{
+    Enqueue({1, 2});
+    EXPECT_EQ(record.Entries(), Numbers({}));
+    worker->Start(!kPaused);
+    EXPECT_TRUE(worker->WaitForExecution(nullptr));
+    EXPECT_EQ(record.Entries(), Numbers({1, 2}));
 }
 
 TEST_F(WorkerThread, TasksMayPostTasks)
 {
     worker->Start(!kPaused);
-    Notes notes;
-    worker->EnqueueAsyncTask(
-        new LambdaTask([&] { worker->EnqueueAsyncTask(notes.Task("inner")); }));
-    worker->WaitForExecution(nullptr);
-    worker->WaitForExecution(nullptr);
-    EXPECT_EQ(notes.texts, (Texts{"inner", "end of inner"}));
-}
-
-// ---- synchronous tasks --------------------------------------------------------------------------
-
-TEST_F(WorkerThread, QueuedSyncTaskRunsBehindTheQueue)
-{
-    worker->Start(!kPaused);
-    Notes notes;
-    Gate gate;
-    worker->EnqueueAsyncTask(gate.Task());
-    worker->EnqueueAsyncTask(notes.Task("queued"));
-    gate.Open();
-    LambdaTask task([&] { notes.texts.push_back("sync"); });
-    worker->RunSyncTask(&task, !kAheadOfQueue, !kDeleteAfterRun);
-    EXPECT_EQ(notes.texts, (Texts{"queued", "end of queued", "sync"}));
-}
-
-TEST_F(WorkerThread, DirectSyncTaskOvertakesTheQueue)
-{
-    worker->Start(!kPaused);
-    Notes notes;
-    Gate gate;
-    worker->EnqueueAsyncTask(gate.Task());
-    gate.WaitUntilReached();
-    worker->EnqueueAsyncTask(notes.Task("queued"));
-    std::thread caller(
-        [&] { worker->RunSyncTask(notes.Task("direct"), kAheadOfQueue, kDeleteAfterRun); });
-    // A paused worker says how many tasks it holds: the queued one and the direct one.
-    worker->Pause();
-    while (driver.CountLogContaining("(Queued task: 2)") == 0)
-        worker->WaitForExecution(nullptr);
-    worker->Resume();
-    gate.Open();
-    caller.join();
-    worker->WaitForExecution(nullptr);
-    EXPECT_EQ(notes.texts, (Texts{"direct", "end of direct", "queued", "end of queued"}));
-}
-
-TEST_F(WorkerThread, DirectSyncTaskRunsWhilePausedAndTheQueueWaits)
-{
-    worker->Start(kPaused);
-    Notes notes;
-    worker->EnqueueAsyncTask(notes.Task("queued"));
-    worker->RunSyncTask(notes.Task("direct"), kAheadOfQueue, kDeleteAfterRun);
-    EXPECT_EQ(notes.texts, (Texts{"direct", "end of direct"}));
-    EXPECT_TRUE(worker->Resume());
-    worker->WaitForExecution(nullptr);
-    EXPECT_EQ(notes.texts, (Texts{"direct", "end of direct", "queued", "end of queued"}));
-}
-
-TEST(WatchedWorkerThread, QueuedSyncTaskBlocksWhilePausedUntilTheResume)
-{
-    SimDriver driver;
-    WatchedWorker worker;
-    worker.Start(kPaused);
-    std::atomic<bool> ran{false};
-    std::thread caller(
-        [&]
+    worker->EnqueueAsyncTask(new CallTask(
+        [this]
         {
-            LambdaTask task([&] { ran = true; });
-            worker.RunSyncTask(&task, !kAheadOfQueue, !kDeleteAfterRun);
-        });
-    worker.WaitUntilQueued(1);
-    EXPECT_FALSE(ran);
-    EXPECT_TRUE(worker.Resume());
-    caller.join();
-    EXPECT_TRUE(ran);
+            record.Add(1);
+            worker->EnqueueAsyncTask(record.NewTask(2));
+        }));
+    worker->WaitForExecution(nullptr);
+    worker->WaitForExecution(nullptr); // behind what the first task posted
+    EXPECT_EQ(record.Entries(), Numbers({1, 2}));
 }
 
-TEST_F(WorkerThread, DeleteFlagDecidesWhoEndsTheTask)
+TEST_F(WorkerThread, IsWokenOnlyWhenItWasIdle)
 {
     worker->Start(!kPaused);
-    for (const bool ahead : {true, false})
-    {
-        bool deleted = false;
-        worker->RunSyncTask(new LambdaTask([] {}, [&] { deleted = true; }), ahead, kDeleteAfterRun);
-        EXPECT_TRUE(deleted);
-        int result = 0;
-        LambdaTask own([&] { result = 42; });
-        worker->RunSyncTask(&own, ahead, !kDeleteAfterRun);
-        EXPECT_EQ(result, 42);
-    }
+    Gate gate(*worker);
+    const int before = SignalsSoFar();
+    for (int i = 0; i < 1000; ++i)
+        worker->EnqueueAsyncTask(new CallTask([] {}));
+    EXPECT_EQ(SignalsSoFar() - before, 1); // for the first of them
 }
 
-TEST_F(WorkerThread, ManySyncCallersAreServedOneAfterTheOther)
+TEST_F(WorkerThread, APausedWorkerIsNotWokenForTasks)
 {
-    worker->Start(!kPaused);
-    int count = 0; // touched on the worker alone
-    std::vector<std::thread> callers;
-    for (int caller = 0; caller < 4; ++caller)
-        callers.emplace_back(
-            [&, ahead = caller % 2 == 0]
-            {
-                for (int i = 0; i < 500; ++i)
-                    worker->RunSyncTask(new LambdaTask([&count] { ++count; }), ahead,
-                                        kDeleteAfterRun);
-            });
-    for (std::thread& caller : callers)
-        caller.join();
-    worker->Terminate();
-    EXPECT_EQ(count, 2000);
-}
-
-// ---- waiting ------------------------------------------------------------------------------------
-
-TEST_F(WorkerThread, WaitTellsHowManyTasksCameBehind)
-{
-    worker->Start(!kPaused);
-    Notes notes;
-    for (const char* name : {"a", "b", "c"})
-        worker->EnqueueAsyncTask(notes.Task(name));
-    int queuedAfter = -1;
-    EXPECT_TRUE(worker->WaitForExecution(&queuedAfter));
-    EXPECT_EQ(queuedAfter, 0);
-    EXPECT_EQ(notes.texts.size(), 6u);
-}
-
-TEST(WatchedWorkerThread, WaitCountsTheTasksBehindIt)
-{
-    SimDriver driver;
-    WatchedWorker worker;
-    worker.Start(!kPaused);
-    Gate gate;
-    worker.EnqueueAsyncTask(gate.Task());
-    int queuedAfter = -1;
-    std::thread waiter([&] { EXPECT_TRUE(worker.WaitForExecution(&queuedAfter)); });
-    worker.WaitUntilQueued(2);
-    for (int i = 0; i < 3; ++i)
-        worker.EnqueueAsyncTask(new LambdaTask([] {}));
-    gate.Open();
-    waiter.join();
-    EXPECT_EQ(queuedAfter, 3);
-}
-
-TEST_F(WorkerThread, WaitOnAPausedOrUnstartedWorkerFailsAtOnce)
-{
-    const std::string function = "virtual bool Nib::WorkerThreadImpl::WaitForExecution(int *)";
-    int untouched = 77;
-    EXPECT_FALSE(worker->WaitForExecution(&untouched));
-    worker->EnqueueAsyncTask(new LambdaTask([] {}));
-    worker->EnqueueAsyncTask(new LambdaTask([] {}));
     worker->Start(kPaused);
-    EXPECT_FALSE(worker->WaitForExecution(&untouched));
-    EXPECT_EQ(untouched, 77);
-    EXPECT_EQ(driver.LogTexts(ANDROID_LOG_ERROR),
-              (Texts{function + ". Worker is on pause (Queued task: 0). No task executed.",
-                     function + ". Worker is on pause (Queued task: 2). No task executed."}));
+    const int before = SignalsSoFar();
+    Enqueue({1, 2, 3});
+    EXPECT_EQ(SignalsSoFar() - before, 0);
     worker->Resume();
+    EXPECT_EQ(SignalsSoFar() - before, 1);
 }
 
-// ---- pause and resume ---------------------------------------------------------------------------
-
-TEST_F(WorkerThread, ResumeAnswersWhetherItWasPaused)
+TEST_F(WorkerThread, WakeupSignalsOnce)
 {
+    FollowedWorker followed;
+    const int before = SignalsSoFar();
+    followed.Wakeup();
+    EXPECT_EQ(SignalsSoFar() - before, 1);
+}
+
+TEST_F(WorkerThread, PostingAllocatesNothing)
+{
+    std::vector<ITask*> tasks;
+    for (int i = 0; i < 100; ++i)
+        tasks.push_back(new CallTask([] {}));
     worker->Start(!kPaused);
-    EXPECT_FALSE(worker->Resume());
+
+    const long before = AllocationsSoFar();
+    for (ITask* task : tasks)
+        worker->EnqueueAsyncTask(task);
+    EXPECT_EQ(AllocationsSoFar() - before, 0);
+}
+
+TEST_F(WorkerThread, AnExceptionOfATaskEndsTheProcess)
+{
+    EXPECT_DEATH(
+        {
+            worker->Start(!kPaused);
+            worker->EnqueueAsyncTask(
+                new CallTask([] { throw std::runtime_error("nobody catches this"); }));
+            worker->Terminate();
+        },
+        "");
+}
+
+// ---- pause ----
+
+TEST_F(WorkerThread, TasksWaitWhileItIsPaused)
+{
+    worker->Start(kPaused);
+    Enqueue({1, 2});
+    RunAhead(*worker, [this] { record.Add(0); });
+    EXPECT_EQ(record.Entries(), Numbers({0}));
+
+    EXPECT_TRUE(worker->Resume());
+    EXPECT_TRUE(worker->WaitForExecution(nullptr));
+    EXPECT_EQ(record.Entries(), Numbers({0, 1, 2}));
+}
+
+TEST_F(WorkerThread, PauseIsAlwaysTrue)
+{
+    EXPECT_TRUE(worker->Pause());
+    worker->Start(!kPaused);
     EXPECT_TRUE(worker->Pause());
     EXPECT_TRUE(worker->Pause());
     EXPECT_FALSE(worker->IsRunning());
+    EXPECT_TRUE(worker->IsStarted());
+    worker->Resume();
+}
+
+TEST_F(WorkerThread, ResumeIsTrueOnlyWhenItWasPaused)
+{
+    EXPECT_TRUE(worker->Resume()); // a new worker is paused
+    EXPECT_FALSE(worker->Resume());
+    worker->Start(kPaused);
     EXPECT_TRUE(worker->Resume());
     EXPECT_TRUE(worker->IsRunning());
 }
 
-TEST_F(WorkerThread, PauseFromATaskHoldsTheRestOfTheQueue)
+TEST_F(WorkerThread, ResumingARunningWorkerSignalsNothing)
 {
     worker->Start(!kPaused);
-    Notes notes;
-    Gate gate;
-    worker->EnqueueAsyncTask(gate.Task());
-    worker->EnqueueAsyncTask(new LambdaTask([this] { worker->Pause(); }));
-    worker->EnqueueAsyncTask(notes.Task("held"));
-    gate.Open();
-    // Runs on the worker once it is paused or before; the held task cannot have run when it is.
-    while (worker->IsRunning())
-        std::this_thread::yield();
-    worker->RunSyncTask(new LambdaTask([] {}), kAheadOfQueue, kDeleteAfterRun);
-    EXPECT_TRUE(notes.texts.empty());
-    worker->Resume();
     worker->WaitForExecution(nullptr);
-    EXPECT_EQ(notes.texts, (Texts{"held", "end of held"}));
+    const int before = SignalsSoFar();
+    EXPECT_FALSE(worker->Resume());
+    EXPECT_EQ(SignalsSoFar() - before, 0);
 }
 
-TEST_F(WorkerThread, PauseAndResumeWhileTasksArriveLosesNone)
+TEST_F(WorkerThread, PauseLetsTheRunningTaskEnd)
 {
     worker->Start(!kPaused);
+    {
+        Gate gate(*worker);
+        Enqueue({1});
+        worker->Pause();
+        gate.Open();
+    }
+    RunAhead(*worker, [this] { record.Add(0); }); // behind the gate, which has ended
+    EXPECT_EQ(record.Entries(), Numbers({0}));
+    worker->Resume();
+    worker->WaitForExecution(nullptr);
+    EXPECT_EQ(record.Entries(), Numbers({0, 1}));
+}
+
+TEST_F(WorkerThread, ATaskMayPauseItsWorker)
+{
+    worker->Start(!kPaused);
+    {
+        Gate gate(*worker);
+        worker->EnqueueAsyncTask(new CallTask([this] { worker->Pause(); }));
+        Enqueue({1});
+    }
+    while (worker->IsRunning())
+        std::this_thread::yield();
+    RunAhead(*worker, [this] { record.Add(0); });
+    EXPECT_EQ(record.Entries(), Numbers({0}));
+    worker->Resume();
+    worker->WaitForExecution(nullptr);
+    EXPECT_EQ(record.Entries(), Numbers({0, 1}));
+}
+
+TEST_F(WorkerThread, NoTaskIsLostBetweenPauseAndResume)
+{
+    constexpr int kTasks = kUnderThreadSanitizer ? 5000 : 50000;
+    worker->Start(!kPaused);
     std::atomic<int> ran{0};
+    std::atomic<bool> posted{false};
     std::thread producer(
         [&]
         {
-            for (int i = 0; i < 20000; ++i)
-                worker->EnqueueAsyncTask(new LambdaTask([&ran] { ++ran; }));
+            for (int i = 0; i < kTasks; ++i)
+                worker->EnqueueAsyncTask(new CallTask([&] { ran.fetch_add(1); }));
+            posted.store(true);
         });
-    for (int i = 0; i < 2000; ++i)
+    while (!posted.load())
     {
         worker->Pause();
         worker->Resume();
     }
     producer.join();
-    worker->Terminate();
-    EXPECT_EQ(ran, 20000);
+    // Not woken here: the last task or the last Resume has done that.
+    while (ran.load() < kTasks)
+        std::this_thread::yield();
+    EXPECT_EQ(ran.load(), kTasks);
 }
 
-// ---- global-lock mode ---------------------------------------------------------------------------
+// ---- waiting ----
 
-TEST(GlobalLockWorker, TwoOfThemNeverRunAtTheSameTime)
+TEST_F(WorkerThread, WaitForExecutionRunsWhatWasQueued)
 {
-    const Worker first(IWorkerThread::CreateInstance_GlobalLock("first", 0));
-    const Worker second(IWorkerThread::CreateInstance_GlobalLock("second", 0));
-    first->Start(!kPaused);
-    second->Start(!kPaused);
-    int guarded = 0; // no atomic: the guard orders the accesses
-    for (int i = 0; i < 2000; ++i)
-    {
-        first->EnqueueAsyncTask(new LambdaTask([&] { ++guarded; }));
-        second->EnqueueAsyncTask(new LambdaTask([&] { ++guarded; }));
-    }
-    first->Terminate();
-    second->Terminate();
-    EXPECT_EQ(guarded, 4000);
-}
-
-TEST(GlobalLockWorker, QueuedSyncTaskEntersTheGuardTwice)
-{
-    const Worker worker(IWorkerThread::CreateInstance_GlobalLock("worker", 0));
     worker->Start(!kPaused);
-    bool ran = false;
-    worker->RunSyncTask(new LambdaTask([&] { ran = true; }), !kAheadOfQueue, kDeleteAfterRun);
-    EXPECT_TRUE(ran);
+    Enqueue({1, 2, 3});
+    int queuedAfter = -5;
+    EXPECT_TRUE(worker->WaitForExecution(&queuedAfter));
+    EXPECT_EQ(record.Entries(), Numbers({1, 2, 3}));
+    EXPECT_EQ(queuedAfter, 0);
 }
 
-// ---- the thread's queue -------------------------------------------------------------------------
-
-namespace
+TEST_F(WorkerThread, WaitForExecutionTellsWhatIsQueuedBehind)
 {
-
-class NamedQueue : public Nib::IGLMsgQueue
-{
-public:
-    bool enQueueMsg(Nib::ITask*) override { return false; }
-    bool waitForCompleting() override { return false; }
-    bool isRunning() override { return false; }
-    const char* getTag() override { return "named"; }
-};
-
-} // namespace
-
-TEST(CurrentMsgQueue, IsNullUntilAttachedAndOfOneThreadAlone)
-{
-    EXPECT_EQ(Nib::GetCurrentMsgQueue(), nullptr);
-    NamedQueue queue;
-    Nib::AttachToThread(&queue);
-    EXPECT_EQ(Nib::GetCurrentMsgQueue(), &queue);
-    std::thread([] { EXPECT_EQ(Nib::GetCurrentMsgQueue(), nullptr); }).join();
-    Nib::AttachToThread(nullptr);
-    EXPECT_EQ(Nib::GetCurrentMsgQueue(), nullptr);
+    FollowedWorker followed;
+    followed.Start(!kPaused);
+    Event allQueued;
+    followed.EnqueueQuietly(new CallTask([&] { allQueued.Wait(); }));
+    followed.onEnqueue = [&] // the wait task is in the queue
+    {
+        followed.EnqueueQuietly(record.NewTask(1));
+        followed.EnqueueQuietly(record.NewTask(2));
+        allQueued.Set();
+    };
+    int queuedAfter = -5;
+    EXPECT_TRUE(followed.WaitForExecution(&queuedAfter));
+    EXPECT_EQ(queuedAfter, 2);
 }
 
-TEST(MsgQueue, TearingIsNotAllowed)
+TEST_F(WorkerThread, WaitForExecutionTakesNull)
 {
-    NamedQueue queue;
-    EXPECT_FALSE(queue.setTearingAllowed(true));
-    EXPECT_FALSE(queue.setTearingAllowed(false));
+    worker->Start(!kPaused);
+    Enqueue({1});
+    EXPECT_TRUE(worker->WaitForExecution(nullptr));
+    EXPECT_EQ(record.Entries(), Numbers({1}));
+}
+
+TEST_F(WorkerThread, WaitForExecutionFailsUnlessItRuns)
+{
+    Enqueue({1, 2});
+    driver.ForgetLog();
+    int queuedAfter = -5;
+
+    EXPECT_FALSE(worker->WaitForExecution(&queuedAfter)); // not started
+    worker->Start(kPaused);
+    EXPECT_FALSE(worker->WaitForExecution(&queuedAfter)); // paused
+
+    EXPECT_EQ(queuedAfter, -5);
+    EXPECT_EQ(record.Entries(), Numbers({}));
+    const std::string line = "virtual bool Nib::WorkerThreadImpl::WaitForExecution(int *). Worker "
+                             "is on pause (Queued task: 2). No task executed.";
+    EXPECT_EQ(driver.LogTexts(ANDROID_LOG_ERROR), (std::vector<std::string>{line, line}));
+    worker->Resume();
 }
