@@ -423,9 +423,10 @@ TEST(RenderThreadFBRPause, ReleasesObjectsThenTellsTheShaderManagerThenEndsTheCo
 
     thread->OnPause();
 
-    EXPECT_EQ(LinesWith(driver, ""), Lines({"I void Nib::GLES::RenderThreadFBRImpl::DoPause()",
-                                            "I void Nib::ShaderManager::OnDestroyContext()",
-                                            "I void Nib::EglContext::Destroy()"}));
+    EXPECT_EQ(LinesWith(driver, ""),
+              Lines({"I void Nib::GLES::RenderThreadFBRImpl::DoPause()", "D second release",
+                     "D first release", "I void Nib::ShaderManager::OnDestroyContext()",
+                     "I void Nib::EglContext::Destroy()"}));
     EXPECT_EQ(NamesOf(ObjectCalls(driver)), Names({"eglMakeCurrent", "eglDestroyContext"}));
     EXPECT_EQ(notes, Lines({"second release with context", "first release with context"}));
     EXPECT_FALSE(thread->GetMsgQueue()->isRunning());
@@ -601,6 +602,25 @@ TEST(RenderThreadFBREnd, LeavesTheWorkerToAnAnswerThatIsStillQueued)
     parent.RunAll();
 
     EXPECT_EQ(driver.CountLogContaining("WorkerThreadImpl() Cleanup"), 1u);
+}
+
+TEST(RenderThreadFBREnd, RunsAResumeThatThePausedParentHasNotAnswered)
+{
+    SimDriver driver(Gpu());
+    ThreadPtr first = StartedParent();
+    ThreadPtr parent = StartedThread(first->GetMsgQueue());
+    ThreadPtr thread = StartedThread(parent->GetMsgQueue());
+    thread->OnPause();
+    parent->OnPause();
+    thread->OnResume(); // asks the paused parent, whose last context is gone
+    EXPECT_FALSE(thread->GetMsgQueue()->isRunning());
+
+    thread.reset();
+
+    EXPECT_EQ(driver.CountLogContaining("FBRImpl::DoResume()"), 1u);
+    EXPECT_EQ(driver.Live().contexts, 2); // the shared one, the first parent's
+    parent->OnResume();                   // now it answers a child that is gone
+    EXPECT_TRUE(parent->GetMsgQueue()->waitForCompleting());
 }
 
 TEST(RenderThreadFBREnd, OfAPausedThreadRunsWhatWaits)

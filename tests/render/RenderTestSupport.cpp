@@ -132,6 +132,7 @@ std::size_t KeepingQueue::Count()
 void NotedObject::Note(const char* what)
 {
     const bool current = eglGetCurrentContext() != EGL_NO_CONTEXT;
+    __android_log_print(ANDROID_LOG_DEBUG, "test", "%s %s", m_name.c_str(), what);
     m_notes->push_back(m_name + " " + what + (current ? " with context" : " without context"));
 }
 

@@ -103,7 +103,8 @@ private:
 
 // ---- managed objects ----------------------------------------------------------------------------
 
-/// Writes what it is told, and whether there is a context then, to a list.
+/// Writes what it is told, and whether there is a context then, to a list and, without the latter,
+/// to the log.
 class NotedObject : public Nib::IManagedObject
 {
 public:

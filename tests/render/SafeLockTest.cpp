@@ -238,6 +238,26 @@ TEST_F(SafeLock, AnOwnerThatWaitsWhileTheUiDoesAsksForNoFrame)
     owner.reset();
 }
 
+TEST_F(SafeLock, WaitsAreRequestsAgainOnceTheUiHasTheLock)
+{
+    thread->Render();
+    {
+        WaitingOwner owner(*thread, [] {});
+        owner.locked.Wait();
+        owner.goOn.Set();
+        Lock()->Lock(true);
+        Lock()->Unlock();
+    }
+    requests = 0;
+    ready = false;
+
+    bool waited = true;
+    std::thread([&] { waited = Queue()->waitForCompleting(); }).join();
+
+    EXPECT_FALSE(waited); // refused, so it was asked for
+    EXPECT_EQ(requests, 1);
+}
+
 TEST_F(SafeLock, AskedForOrdinarilyTheUiDoesNotDraw)
 {
     thread->Render();
