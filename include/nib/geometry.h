@@ -89,10 +89,9 @@ public:
 /// Owner    the caller, from the renderer factory; ended by Release(), never by delete.
 /// Threads  the GL thread that made it, with its context current.
 /// Loss     after a context was lost and made anew, the buffers have their old sizes and no
-/// contents;
-///          upload again with UpdateBuffer and UpdateIndexes.
-/// GL state draws bind buffers and enable attribute arrays; which arrays stay enabled is said
-/// below.
+///          contents: fill them again with UpdateBuffer and UpdateIndexes.
+/// State    draws bind buffers and enable attribute arrays; which of them stay enabled is said
+///          below.
 class NIB_EXPORT IGraphicsObject
 {
 public:

@@ -129,7 +129,7 @@ struct TextureBufferInfo
 /// Loss     after a context was lost and made anew, size and parameters are as before, the contents
 ///          and the tag are gone. An alias keeps dead names: make it again.
 /// Alias    never owns the names it shares, and must not outlive its source.
-/// GL state operations change bindings; only SetData puts the former one back.
+/// State    operations change bindings; only SetData puts the former one back.
 /// Pixels   laid out as the descriptor says. Row lengths are in pixels; 0 is the texture's width.
 class NIB_EXPORT ITextureObject
 {

@@ -259,3 +259,13 @@ TEST_F(TextureParameterPath, ReleaseDeletesTheTextureAlone)
     queue.observer.DispatchRelease();
     EXPECT_EQ(CallTexts(), (Texts{"glDeleteTextures(1)"}));
 }
+
+TEST_F(TextureParameterPath, RestoreLogsThePendingError)
+{
+    const Texture texture = Made(Described(1));
+    queue.observer.DispatchRelease();
+    driver.QueueGlErrors({GL_OUT_OF_MEMORY});
+    queue.observer.DispatchRestore();
+    EXPECT_EQ(Infos().back(), "virtual void Nib::GLES::TextureObject::RestoreGLObject() - Restore "
+                              "Was called. Texture After - 2 (err: 1285)");
+}

@@ -74,7 +74,7 @@ TEST_F(TextureUseDeathTest, ActivateOfAFifthUnitAborts)
     testing::GTEST_FLAG(death_test_style) = "threadsafe";
     const Texture texture = Made(4, 2);
     EXPECT_DEATH(texture->Activate(4),
-                 "Error! Please, change value of variable MAX_ACTIVE_TEXTURES by 5");
+                 "nib_log: cond: Error! Please, change value of variable MAX_ACTIVE_TEXTURES by 5");
     EXPECT_DEATH(texture->Activate(9),
                  "Error! Please, change value of variable MAX_ACTIVE_TEXTURES by 10");
 }
