@@ -57,7 +57,7 @@ public:
     bool key(string_t& name) override
     {
         if (m_depth == 1)
-            m_name = name;
+            BeginList(name);
         else
             m_coordinate = name == "x" ? 0 : name == "y" ? 1 : name == "pressure" ? 2 : 3;
         return true;
@@ -81,6 +81,19 @@ private:
         problem = "neither pointer events nor lists of points";
         return false;
     }
+    void BeginList(const std::string& name)
+    {
+        m_name = name;
+        m_column = nullptr;
+        m_hasStroke = false;
+    }
+    /// The current list as a list of numbers. Looked up once a list: names may be long.
+    std::vector<double>& Column()
+    {
+        if (!m_column)
+            m_column = &columns[m_name];
+        return *m_column;
+    }
     bool Number(double value)
     {
         if (++m_count > kMostValues)
@@ -89,7 +102,7 @@ private:
             return false;
         }
         if (m_depth == kList)
-            columns[m_name].push_back(value);
+            Column().push_back(value);
         else if (m_depth == kPoint && m_coordinate < 4)
         {
             if (m_point.size() <= m_coordinate)
@@ -106,7 +119,7 @@ private:
     }
     bool EndPoint()
     {
-        if (strokes.empty() || strokes.back().first != m_name)
+        if (!std::exchange(m_hasStroke, true))
             strokes.emplace_back(m_name, std::vector<Point>());
         if (m_point.size() < 2 || std::isnan(m_point[0]) || std::isnan(m_point[1]))
         {
@@ -118,6 +131,8 @@ private:
     }
 
     std::string m_name;
+    std::vector<double>* m_column = nullptr; ///< of the current list, once it has a number
+    bool m_hasStroke = false;                ///< the current list has a point
     Point m_point;
     std::size_t m_coordinate = 0;
     std::size_t m_count = 0;

@@ -16,6 +16,10 @@ namespace Ink
 namespace
 {
 
+// What no recording needs; beyond it, reading would take long.
+constexpr int kDeepestElement = 256;
+constexpr std::size_t kMostChannels = 64;
+
 /// The name without its namespace prefix.
 std::string_view LocalName(const pugi::xml_node& node)
 {
@@ -72,19 +76,25 @@ private:
 
     /// Every node below @p root in document order, without recursion: depth is the file's choice.
     template <typename Visit>
-    static void Walk(const pugi::xml_node& root, Visit visit)
+    void Walk(const pugi::xml_node& root, Visit visit) const
     {
         pugi::xml_node node = root;
+        int depth = 1;
         while (node)
         {
             visit(node);
             if (node.first_child())
             {
                 node = node.first_child();
+                if (++depth > kDeepestElement)
+                    Fail(node.offset_debug(), "the elements are nested too deeply");
                 continue;
             }
             while (node && node != root && !node.next_sibling())
+            {
                 node = node.parent();
+                --depth;
+            }
             node = node == root ? pugi::xml_node() : node.next_sibling();
         }
     }
@@ -99,6 +109,8 @@ private:
                  else if (LocalName(node) == "context" && !Id(node).empty())
                      m_contexts.emplace(Id(node), node);
              });
+        for (const auto& [id, node] : m_contexts)
+            m_formatsByContext.emplace(id, FormatOfContext(node));
     }
 
     void AddFormat(const pugi::xml_node& node)
@@ -113,6 +125,8 @@ private:
                         format.intermittent.push_back(ReadChannel(optional));
         if (!format.Has("X") || !format.Has("Y"))
             Fail(node.offset_debug(), "the trace format has no X or no Y channel");
+        if (format.channels.size() + format.intermittent.size() > kMostChannels)
+            Fail(node.offset_debug(), "the trace format has more than 64 channels");
         m_formatsByNode.emplace(node.hash_value(), format);
         if (!Id(node).empty())
             m_formatsById.emplace(Id(node), format);
@@ -137,24 +151,26 @@ private:
     TraceFormat FormatOf(const pugi::xml_node& trace) const
     {
         for (pugi::xml_node node = trace; node; node = node.parent())
-            if (const pugi::xml_attribute reference = node.attribute("contextRef"))
-                if (const TraceFormat* format = FormatOfContext(Target(reference)))
-                    return *format;
+        {
+            const pugi::xml_attribute reference = node.attribute("contextRef");
+            const auto format =
+                reference ? m_formatsByContext.find(Target(reference)) : m_formatsByContext.end();
+            if (format != m_formatsByContext.end() && format->second)
+                return *format->second;
+        }
         return m_firstFormat ? *m_firstFormat : TraceFormat::Plain();
     }
 
-    const TraceFormat* FormatOfContext(std::string_view id) const
+    /// The format that @p context refers to or holds; null when it has none.
+    const TraceFormat* FormatOfContext(const pugi::xml_node& context) const
     {
-        const auto context = m_contexts.find(id);
-        if (context == m_contexts.end())
-            return nullptr;
-        if (const pugi::xml_attribute reference = context->second.attribute("traceFormatRef"))
+        if (const pugi::xml_attribute reference = context.attribute("traceFormatRef"))
         {
             const auto format = m_formatsById.find(Target(reference));
             return format == m_formatsById.end() ? nullptr : &format->second;
         }
         const TraceFormat* found = nullptr;
-        Walk(context->second,
+        Walk(context,
              [&](const pugi::xml_node& node)
              {
                  const auto format = m_formatsByNode.find(node.hash_value());
@@ -186,6 +202,8 @@ private:
             Fail(node.offset_debug(), "the trace has no point");
         m_count += stroke.size();
         GoOnFrom(stroke, format.Has("T"));
+        if (!std::isfinite(m_time))
+            Fail(node.offset_debug(), "the times are out of range");
         const bool isAbove = std::string_view(node.attribute("type").value()) == "penUp";
         (isAbove ? m_recording.hovers : m_recording.strokes).push_back(std::move(stroke));
     }
@@ -208,6 +226,7 @@ private:
     std::map<std::string, TraceFormat, std::less<>> m_formatsById;
     std::map<std::size_t, TraceFormat> m_formatsByNode;
     std::map<std::string, pugi::xml_node, std::less<>> m_contexts;
+    std::map<std::string, const TraceFormat*, std::less<>> m_formatsByContext;
     std::optional<TraceFormat> m_firstFormat;
     double m_time = 0.0;
     std::size_t m_count = 0;

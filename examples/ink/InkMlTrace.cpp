@@ -60,7 +60,8 @@ bool TraceDecoder::Decode(std::string_view text, std::size_t most, Stroke& strok
         if (!DecodePoint(Trimmed(text.substr(0, comma)), problem))
             return false;
         const Sample sample = ToSample();
-        if (!std::isfinite(sample.x) || !std::isfinite(sample.y) || !std::isfinite(sample.time))
+        if (!std::isfinite(sample.x) || !std::isfinite(sample.y) || !std::isfinite(sample.time) ||
+            !std::isfinite(sample.pressure))
         {
             problem = "a value of a point is out of range";
             return false;
@@ -161,6 +162,7 @@ Sample TraceDecoder::ToSample() const
 {
     Sample sample;
     float tiltX = 0.0f, tiltY = 0.0f;
+    double azimuth = sample.azimuth, altitude = sample.altitude;
     for (std::size_t i = 0; i < m_channels.size(); ++i)
     {
         const Channel& channel = m_channels[i];
@@ -181,10 +183,11 @@ Sample TraceDecoder::ToSample() const
         else if (channel.name == "OTy")
             tiltY = static_cast<float>(value);
         else if (channel.name == "OA")
-            sample.azimuth = static_cast<float>(value);
+            azimuth = value;
         else if (channel.name == "OE")
-            sample.altitude = static_cast<float>(value);
+            altitude = value;
     }
+    SetLean(sample, azimuth, altitude);
     SetTilt(sample, tiltX, tiltY);
     return sample;
 }

@@ -8,7 +8,7 @@ namespace Ink
 namespace
 {
 
-constexpr float kDegree = 3.14159265f / 180.0f;
+constexpr double kDegree = 3.14159265358979323846 / 180.0;
 
 template <typename Visit>
 void ForEachSample(Recording& recording, Visit visit)
@@ -42,15 +42,24 @@ Recording RecordingBuilder::Finish(std::size_t lastLine)
     return std::move(m_recording);
 }
 
+void SetLean(Sample& sample, double azimuth, double altitude)
+{
+    if (!std::isfinite(azimuth) || !std::isfinite(altitude))
+        return;
+    const double rest = std::fmod(azimuth, 360.0);
+    sample.azimuth = static_cast<float>(rest < 0.0 ? rest + 360.0 : rest);
+    sample.altitude = static_cast<float>(std::clamp(altitude, 0.0, 90.0));
+}
+
 void SetTilt(Sample& sample, float tiltX, float tiltY)
 {
     if (!(std::abs(tiltX) <= 90.0f) || !(std::abs(tiltY) <= 90.0f) || (tiltX == 0 && tiltY == 0))
         return; // upright, or not known
-    const float tanX = std::tan(tiltX * kDegree);
-    const float tanY = std::tan(tiltY * kDegree);
-    const float azimuth = std::atan2(tanY, tanX) / kDegree;
-    sample.azimuth = azimuth < 0.0f ? azimuth + 360.0f : azimuth;
-    sample.altitude = std::atan(1.0f / std::hypot(tanX, tanY)) / kDegree;
+    // In double: there, the tangent of 90 degrees has the right sign.
+    const double tanX = std::tan(tiltX * kDegree);
+    const double tanY = std::tan(tiltY * kDegree);
+    SetLean(sample, std::atan2(tanY, tanX) / kDegree,
+            std::atan(1.0 / std::hypot(tanX, tanY)) / kDegree);
 }
 
 void ScalePressures(Recording& recording)

@@ -27,7 +27,7 @@ public:
 
     [[noreturn]] void Fail(std::size_t line, const std::string& problem) const
     {
-        throw ReadError(m_path, line, problem);
+        throw ReadError(m_path, line == 0 ? 1 : line, problem); // 0: the text has no line at all
     }
 
 private:
@@ -37,6 +37,10 @@ private:
     bool m_isBroken = true;
     bool m_wasDown = false;
 };
+
+/// Sets where the pen leans, in degrees, brought into the ranges of a sample; nothing where one of
+/// them is not finite.
+void SetLean(Sample& sample, double azimuth, double altitude);
 
 /// Sets the pen's altitude and azimuth from its tilts against the upright, in degrees (W3C Pointer
 /// Events, Level 3, "Converting between tiltX/tiltY and altitudeAngle/azimuthAngle").

@@ -26,8 +26,7 @@ Sample ToSample(const std::vector<double>& numbers)
     sample.x = static_cast<float>(numbers[0]);
     sample.y = static_cast<float>(-numbers[1]);
     sample.time = numbers[2];
-    sample.azimuth = static_cast<float>(numbers[4] / 10.0);
-    sample.altitude = static_cast<float>(numbers[5] / 10.0);
+    SetLean(sample, numbers[4] / 10.0, numbers[5] / 10.0);
     sample.pressure = static_cast<float>(numbers[6]);
     return sample;
 }
