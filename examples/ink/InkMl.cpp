@@ -86,7 +86,7 @@ private:
             if (node.first_child())
             {
                 node = node.first_child();
-                if (++depth > kDeepestElement)
+                if (++depth > kDeepestElement && node.type() == pugi::node_element)
                     Fail(node.offset_debug(), "the elements are nested too deeply");
                 continue;
             }

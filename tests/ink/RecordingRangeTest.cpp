@@ -159,7 +159,7 @@ TEST(InkMlSize, AFormatMayHaveSixtyFourChannels)
 
 TEST(InkMlSize, AContextIsSearchedOnceForAllItsTraces)
 {
-    // Quadratic, this would take minutes.
+    // Quadratic, this would take much longer than a test may.
     const Recording recording = Ink::ReadInkMl(
         "file", "<ink><context id=\"c\">" + Repeated(40000, "<a/>") +
                     "<traceFormat><channel name=\"Y\"/><channel name=\"X\"/></traceFormat>"
@@ -171,7 +171,7 @@ TEST(InkMlSize, AContextIsSearchedOnceForAllItsTraces)
 
 TEST(InkJsonSize, LongNamesAreLookedUpOnceAList)
 {
-    // Quadratic, this would take minutes.
+    // Quadratic, this would take much longer than a test may.
     const std::string name(2000000, 'k');
     const Recording recording =
         Ink::ReadInkJson("file", "{\"" + name + "\":[" + Repeated(200000, "[1,2],") + "[1,2]]}");
