@@ -250,7 +250,7 @@ TEST_F(WorkerThreadPool, WaitingEndsAtTheFirstMemberThatDoesNotRun)
     pool->Resume();
 }
 
-TEST_F(WorkerThreadPool, TerminateReachesMembersBehindAnUnstartedOne)
+TEST_F(WorkerThreadPool, TerminateEndsTheMembersThatHaveStarted)
 {
     RefuseThread(2);
     pool->Start(!kPaused); // only the first
