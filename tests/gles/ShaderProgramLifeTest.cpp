@@ -229,11 +229,14 @@ TEST_F(ShaderProgramLife, AfterARefusalOfAHeldBinaryTheNextBuildLooksItUpAgain)
     RefuseBinary();
     queue.observer.DispatchRestore(); // holds none from now on
     LoseContext();
+    const auto before = ShaderProgramCache::GetInstance()->HoldBinaryShader(
+        ShaderProgramCache::GetShaderKey(kVertex, kFragment));
     RefuseBinary();
 
     queue.observer.DispatchRestore();
     EXPECT_EQ(Errors(), Texts{kRefused});
-    ASSERT_EQ(Warnings().size(), 1u) << "the refused one is replaced under its key";
+    EXPECT_EQ(Warnings().size(), 1u);
+    EXPECT_NE(Record(), before.get()) << "the refused one is replaced under its key";
     EXPECT_EQ(folder.Names(), (Texts{"sh0.dat", FileOf(kVertex, kFragment)}));
 }
 
@@ -243,10 +246,11 @@ TEST_F(ShaderProgramLife, ABinaryThatTheCacheReplacedIsLookedUpAgain)
     const Program holder = Built();
     LoseContext();
     queue.observer.DispatchRestore();
-    const auto* const before = Record();
+    const auto before = ShaderProgramCache::GetInstance()->HoldBinaryShader(
+        ShaderProgramCache::GetShaderKey(kVertex, kFragment)); // as a thread that is reading it
     RefuseBinary();
     const Program other = Built();
-    ASSERT_NE(Record(), before);
+    ASSERT_NE(Record(), before.get());
     LoseContext();
 
     // When the driver refuses the new one too, it is replaced under its key: it was looked up
