@@ -1,11 +1,13 @@
 #include "gles/OpenGLShaderProgram.h"
 
 #include "gles/AttributeScanner.h"
-#include "gles/InvalidArgument.h"
 #include "gles/ParameterBindingImpl.h"
+#include "gles/Throw.h"
 #include "gles/UniformName.h"
 
 #include "base/Log.h"
+
+#include <nib/exceptions.h>
 
 #include <algorithm>
 
@@ -182,7 +184,8 @@ bool OpenGLShaderProgram::LoadFromBinary(const BinaryShader* binary)
 void OpenGLShaderProgram::createShaderFromSource(std::vector<std::string>& attributes)
 {
     if (!m_vertexSource || !m_fragmentSource)
-        ThrowInvalidArgument("OpenGLRenderer::createShader: no shader source code provided.");
+        Throw<InvalidArgumentException>(
+            "OpenGLRenderer::createShader: no shader source code provided.");
 
     const GLuint vertex = glCreateShader(GL_VERTEX_SHADER);
     if (!Compile(vertex, m_vertexSource))
@@ -190,7 +193,7 @@ void OpenGLShaderProgram::createShaderFromSource(std::vector<std::string>& attri
         const InfoLog log(glGetShaderInfoLog, vertex);
         NIB_LOG_INFO("VS error = %s", log.text);
         glDeleteShader(vertex);
-        ThrowInvalidArgument(
+        Throw<InvalidArgumentException>(
             std::string("OpenGLRenderer::createShader: failed to compile vertex shader.\n"
                         "Details:\n") +
             log.text);
@@ -203,7 +206,7 @@ void OpenGLShaderProgram::createShaderFromSource(std::vector<std::string>& attri
         NIB_LOG_INFO("FS error = %s", log.text);
         glDeleteShader(vertex);
         glDeleteShader(fragment);
-        ThrowInvalidArgument(
+        Throw<InvalidArgumentException>(
             std::string("OpenGLRenderer::createShader: failed to compile fragment shader.\n"
                         "Details:\n") +
             log.text);
@@ -227,7 +230,7 @@ void OpenGLShaderProgram::LinkShaders(GLuint vertex, GLuint fragment,
         glDeleteShader(vertex);
         glDeleteShader(fragment);
         glDeleteProgram(program);
-        ThrowInvalidArgument(
+        Throw<InvalidArgumentException>(
             std::string("OpenGLRenderer::createShader: failed to link program.\nDetails:\n") +
             log.text);
     }
@@ -308,7 +311,7 @@ IParameterBinding* OpenGLShaderProgram::GetBindingIntf(const char* name)
         }
         else if (active)
         {
-            ThrowInvalidArgument(
+            Throw<InvalidArgumentException>(
                 std::string("OpenGLShaderProgram::GetBindingIntf: failed to find uniform with "
                             "given name(") +
                 name + ")");

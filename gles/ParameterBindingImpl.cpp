@@ -1,7 +1,9 @@
 #include "gles/ParameterBindingImpl.h"
 
-#include "gles/InvalidArgument.h"
 #include "gles/OpenGLShaderProgram.h"
+#include "gles/Throw.h"
+
+#include <nib/exceptions.h>
 
 #include <GLES3/gl3.h>
 
@@ -29,7 +31,8 @@ const void* IParameterBinding::GetValue() const
     case BindingType::UniformBlock: return &m_intValue;
     case BindingType::Undefined: break;
     }
-    GLES::ThrowInvalidArgument("ParameterBindingImpl::GetValue: type of binding is undefined");
+    GLES::Throw<InvalidArgumentException>(
+        "ParameterBindingImpl::GetValue: type of binding is undefined");
 }
 
 } // namespace Nib
@@ -93,7 +96,7 @@ void ParameterBindingImpl::SetValue(const void* value)
         return glUniformBlockBinding(m_program->GetShaderId(), static_cast<GLuint>(m_location),
                                      static_cast<GLuint>(m_intValue));
     }
-    ThrowInvalidArgument("ParameterBindingImpl::SetValue: type of binding is undefined");
+    Throw<InvalidArgumentException>("ParameterBindingImpl::SetValue: type of binding is undefined");
 }
 
 void ParameterBindingImpl::Release()

@@ -4,13 +4,12 @@
 /// @file
 /// Render threads: GL contexts with a task queue, in four kinds.
 ///
-/// | kind         | type | made with                      | context shares with     | presents |
-/// |--------------|------|--------------------------------|-------------------------|-------------------|
-/// | HWUI         | 0    | GLES::CreateHWUIRenderer       | is the UI's own context | the UI does |
-/// | surface      | 1    | GLES::CreateSurfaceRenderer    | the process-wide one    | swaps, by
-/// damage  | | front buffer | 2    | GLES::CreateFBRSurfaceRenderer | its parent's            |
-/// draws on screen   | | offscreen    | 3    | GLES::CreateOffscreenRenderer  | its parent's |
-/// nothing           |
+/// | kind         | type | made with                      | shares its context with | presents            |
+/// |--------------|------|--------------------------------|-------------------------|---------------------|
+/// | HWUI         | 0    | GLES::CreateHWUIRenderer       | it is the UI's own      | the UI does         |
+/// | surface      | 1    | GLES::CreateSurfaceRenderer    | the process-wide one    | swaps, by damage    |
+/// | front buffer | 2    | GLES::CreateFBRSurfaceRenderer | its parent's            | draws on the screen |
+/// | offscreen    | 3    | GLES::CreateOffscreenRenderer  | its parent's            | nothing             |
 
 #include <nib/base.h>
 #include <nib/export.h>

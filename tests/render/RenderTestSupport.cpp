@@ -55,6 +55,12 @@ void Event::Set()
     m_condition.notify_all();
 }
 
+bool Event::WaitFor(std::chrono::milliseconds time)
+{
+    std::unique_lock lock(m_mutex);
+    return m_condition.wait_for(lock, time, [this] { return m_set; });
+}
+
 void Event::Wait()
 {
     std::unique_lock lock(m_mutex);

@@ -9,6 +9,7 @@
 #include <nib/task.h>
 
 #include <atomic>
+#include <chrono>
 #include <condition_variable>
 #include <deque>
 #include <functional>
@@ -46,6 +47,8 @@ class Event
 public:
     void Set();
     void Wait();
+    /// False when it was not set in time.
+    bool WaitFor(std::chrono::milliseconds time);
     bool IsSet() const;
 
 private:

@@ -206,7 +206,7 @@ TEST(RenderThreadGLDeathTest, StartBlocksForEverWithoutAThread)
     {
         SimDriver driver;
         ThreadPtr thread = NewThread();
-        std::atomic<bool> returned{false};
+        Event returned;
         std::thread caller;
         Event calling;
         // The caller exists before no further thread can be started.
@@ -215,14 +215,15 @@ TEST(RenderThreadGLDeathTest, StartBlocksForEverWithoutAThread)
             {
                 calling.Wait();
                 thread->Start();
-                returned = true;
+                returned.Set();
             });
         const NoMoreThreads noMore;
         calling.Set();
         while (driver.CountLogContaining("Failed to start thrtead") == 0)
             std::this_thread::yield();
-        std::this_thread::sleep_for(std::chrono::milliseconds(300));
-        std::_Exit(returned ? 1 : 0);
+        // "Never" is a time-out here: nothing wakes this wait but a return that must not come.
+        const bool cameBack = returned.WaitFor(std::chrono::milliseconds(300));
+        std::_Exit(cameBack ? 1 : 0);
     };
 
     EXPECT_EXIT(blocksInStart(), testing::ExitedWithCode(0), "");
