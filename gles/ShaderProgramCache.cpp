@@ -1,12 +1,12 @@
 #include "base/Log.h"
 #include "gles/BinaryShaderFile.h"
+#include "gles/BinaryShaderReader.h"
 
 #include <nib/shader_cache.h>
 
 #include <algorithm>
 #include <atomic>
 #include <cerrno>
-#include <climits>
 #include <cstdio>
 #include <cstring>
 #include <utility>
@@ -42,18 +42,6 @@ bool OpenTemporary(File& file, const std::string& path, String& name)
             break;
     }
     return false;
-}
-
-// The number in the file may be one that no int holds; the line then shows all of it.
-void ReportAttributeCount(const char* function, std::uint64_t expected, std::size_t found)
-{
-    const int names = static_cast<int>(found);
-    if (expected <= INT_MAX)
-        NIB_LOG_ERROR("%s Filed to parse shader attributes. Expected=%d. Found = %d", function,
-                      static_cast<int>(expected), names);
-    else
-        NIB_LOG_ERROR("%s Filed to parse shader attributes. Expected=%lu. Found = %d", function,
-                      static_cast<unsigned long>(expected), names);
 }
 
 std::uint64_t CrcOfText(std::uint64_t crc, const char* text)
@@ -289,66 +277,9 @@ ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderK
                       path);
         return nullptr;
     }
-    errno = 0; // a file that is merely too short sets none
-
-    BinaryShaderHeader header;
-    if (file.Read(&header, 1, sizeof header) != sizeof header ||
-        header.magic != kBinaryShaderMagic || header.programLength == 0)
-    {
-        NIB_LOG_ERROR("%s File header read error Err=%d, File = %s", function, errno, path);
-        return nullptr;
-    }
-    if (header.programLength > kLongestProgram || header.attributeSize > kLargestAttributes)
-    {
-        NIB_LOG_ERROR("%s Program size (%lu) OR Attribute size (%lu) is too big to allocate "
-                      "memory. File = %s",
-                      function, static_cast<unsigned long>(header.programLength),
-                      static_cast<unsigned long>(header.attributeSize), path);
-        return nullptr;
-    }
-    auto shader = std::make_unique<BinaryShader>();
-    const auto length = static_cast<std::size_t>(header.programLength);
-    shader->bytes = new unsigned char[length];
-    if (file.Read(shader->bytes, 1, length) != length)
-    {
-        NIB_LOG_ERROR("%s File shader bin read error Err=%d, File = %s", function, errno, path);
-        return nullptr;
-    }
-    std::uint64_t crc = ContinueCrc(0, &header, sizeof header);
-    crc = ContinueCrc(crc, shader->bytes, length);
-
-    if (header.attributeSize != 0)
-    {
-        std::vector<unsigned char> block(static_cast<std::size_t>(header.attributeSize));
-        if (file.Read(block.data(), 1, block.size()) != block.size())
-        {
-            NIB_LOG_ERROR("%s File attribs read error Err=%d, File = %s", function, errno, path);
-            return nullptr;
-        }
-        crc = ContinueCrc(crc, block.data(), block.size());
-        const bool isParsed = ParseShaderAttributes(
-            block.data(), static_cast<unsigned int>(block.size()), shader->attributes);
-        if (!isParsed || shader->attributes.size() != header.attributeCount)
-        {
-            ReportAttributeCount(function, header.attributeCount, shader->attributes.size());
-            return nullptr;
-        }
-    }
-    std::uint64_t storedCrc = 0;
-    if (file.Read(&storedCrc, sizeof storedCrc, 1) != 1)
-    {
-        NIB_LOG_ERROR("%s Filed to read CRC from file. Err=%d, File = %s", function, errno, path);
-        return nullptr;
-    }
-    if (storedCrc != crc)
-    {
-        NIB_LOG_ERROR("%s Invalid CRC, From file: %lu, Calculated: = %lu", function,
-                      static_cast<unsigned long>(storedCrc), static_cast<unsigned long>(crc));
-        return nullptr;
-    }
-    shader->key = key;
-    shader->length = static_cast<std::int32_t>(header.programLength);
-    shader->format = static_cast<std::uint32_t>(header.format);
+    std::unique_ptr<BinaryShader> shader = BinaryShaderReader(file, path, function).Read();
+    if (shader)
+        shader->key = key;
     return shader.release();
 }
 
