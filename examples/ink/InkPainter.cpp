@@ -82,8 +82,8 @@ InkPainter::InkPainter()
     Nib::TextureDescriptor brush; // RGBA, linear filters, clamped to the edge
     brush.width = kBrushWidth;
     brush.height = 1;
-    m_brush.reset(Factory::CreateTextureObject(brush, BrushPixels().data(), nullptr, 0, nullptr));
-    m_brush->SetTag("ink brush");
+    m_brush.Reset(Factory::CreateTextureObject(brush, BrushPixels().data(), nullptr, 0, nullptr),
+                  "ink brush");
 
     m_blending.reset(Factory::CreateBlendStateObject(Nib::BlendStateDescriptor(true)));
 }
@@ -111,8 +111,14 @@ void InkPainter::Draw(const std::vector<Vertex>& triangles, const Colour& colour
     }
 }
 
+void InkPainter::ForgetContents()
+{
+    m_brush.Forget();
+}
+
 void InkPainter::RestoreContents()
 {
+    m_brush.Remember();
     m_brush->Update(BrushPixels().data(), 0);
 }
 

@@ -3,6 +3,7 @@
 
 #include "PostTask.h"
 #include "StrokeMesh.h"
+#include "TrackedTexture.h"
 
 #include <nib/nib.h>
 
@@ -36,7 +37,10 @@ public:
     /// holds already.
     void Draw(const std::vector<Vertex>& triangles, const Colour& colour, int width, int height);
 
-    /// Uploads the brush again.
+    /// Before the context is lost.
+    void ForgetContents();
+
+    /// Uploads the brush again, with the new context.
     void RestoreContents();
 
 private:
@@ -45,7 +49,7 @@ private:
     Owned<Nib::IParameterBinding> m_colour;
     Owned<Nib::IParameterBinding> m_brushUnit;
     Owned<Nib::IGraphicsObject> m_mesh;
-    Owned<Nib::ITextureObject> m_brush;
+    TrackedTexture m_brush;
     Owned<Nib::IBlendStateObject> m_blending;
 };
 

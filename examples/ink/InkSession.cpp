@@ -55,6 +55,7 @@ InkSession::~InkSession()
              gl->view.reset();
              gl->page.reset();
              gl->painter.reset();
+             Nib::ResourceChecker::leakCheckLookup(true); // in engineering builds
          });
     m_thread.GetMsgQueue()->waitForCompleting();
 }
@@ -96,7 +97,12 @@ void InkSession::Present()
 void InkSession::LoseContext()
 {
     auto pixels = std::make_shared<std::vector<std::uint8_t>>();
-    PostGuarded([pixels](GlState& gl) { *pixels = gl.page->Suspend(); });
+    PostGuarded(
+        [pixels](GlState& gl)
+        {
+            *pixels = gl.page->Suspend();
+            gl.painter->ForgetContents();
+        });
     m_thread.OnPause(); // behind the task above; the objects let go of their GL names
 
     m_thread.OnResume(); // the objects get new names, their contents are ours to bring

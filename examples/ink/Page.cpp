@@ -14,10 +14,10 @@ Page::Page(int width, int height, const Colour& paper) : m_paper(paper)
         Nib::kTextureParamMinFilter,
         Nib::kTextureFilterNearest,
     };
-    m_texture.reset(
-        Nib::RendererFactory::CreateTextureObject(descriptor, nullptr, nearest, 2, nullptr));
-    m_texture->SetTag("page");
-    m_target.reset(Nib::RendererFactory::CreateOffscreenRenderTarget(m_texture.get()));
+    m_texture.Reset(
+        Nib::RendererFactory::CreateTextureObject(descriptor, nullptr, nearest, 2, nullptr),
+        "page");
+    m_target.reset(Nib::RendererFactory::CreateOffscreenRenderTarget(&*m_texture));
     Clear();
 }
 
@@ -31,13 +31,15 @@ std::vector<std::uint8_t> Page::Suspend()
 {
     std::vector<std::uint8_t> pixels = ReadPixels();
     m_target.reset();
+    m_texture.Forget();
     return pixels;
 }
 
 void Page::Resume(const std::vector<std::uint8_t>& pixels)
 {
+    m_texture.Remember();
     m_texture->Update(pixels.data(), 0);
-    m_target.reset(Nib::RendererFactory::CreateOffscreenRenderTarget(m_texture.get()));
+    m_target.reset(Nib::RendererFactory::CreateOffscreenRenderTarget(&*m_texture));
 }
 
 void Page::Draw(InkPainter& painter, const std::vector<Vertex>& triangles, const Colour& colour)

@@ -2,6 +2,7 @@
 #define INK_PAGE_H
 
 #include "InkPainter.h"
+#include "TrackedTexture.h"
 
 #include <nib/nib.h>
 
@@ -41,7 +42,7 @@ public:
 
 private:
     Colour m_paper;
-    Owned<Nib::ITextureObject> m_texture;
+    TrackedTexture m_texture;
     Owned<Nib::IOffscreenRenderTarget> m_target; // before the texture, which it draws into, ends
 };
 

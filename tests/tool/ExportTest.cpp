@@ -100,6 +100,21 @@ TEST(LoseContext, BuildsProgramsFromTheCache)
     EXPECT_EQ(Count(result.err, "cached binary shader is not valid"), 0);
 }
 
+TEST(EngineeringBuild, NothingIsLeftAtTheEnd)
+{
+    TemporaryFolder folder;
+    std::map<std::string, std::string> environment = kNoDisplay;
+    environment["NIB_LOG"] = "debug";
+    environment["NIB_BUILD_TYPE"] = "eng";
+    environment["NIB_CACHE_DIR"] = folder.Path("sdk");
+    const NibResult result = RunNib({"draw", NIB_SAMPLE, "-o", folder.Path("page.png"),
+                                     "--lose-context", "every:100", "--export", "2"},
+                                    environment);
+    ASSERT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(Count(result.err, "resource leak detected"), 0);
+    EXPECT_EQ(Count(result.err, "RESOURCE LEAK"), 0);
+}
+
 TEST(LoseContext, BadOptionIsNamed)
 {
     const NibResult result =
