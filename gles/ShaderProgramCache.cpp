@@ -1,6 +1,7 @@
 #include "base/Log.h"
 #include "gles/BinaryShaderFile.h"
 #include "gles/BinaryShaderReader.h"
+#include "gles/TemporaryFiles.h"
 
 #include <nib/shader_cache.h>
 
@@ -11,8 +12,6 @@
 #include <cstring>
 #include <utility>
 
-#include <unistd.h>
-
 namespace Nib
 {
 
@@ -20,14 +19,6 @@ namespace
 {
 
 constexpr int kMostTemporaryNames = 16; ///< tried for one file
-
-/// A name beside @p path that no other thread uses.
-std::string TemporaryName(const std::string& path)
-{
-    static std::atomic<unsigned> counter{0};
-    return path + "." + std::to_string(getpid()) + "." +
-           std::to_string(counter.fetch_add(1, std::memory_order_relaxed)) + ".tmp";
-}
 
 /// Opens a new file beside @p path, for this user alone, and gives its name in @p name. What an
 /// earlier process left under such a name, or somebody planted there, is passed over.
@@ -145,6 +136,10 @@ bool ShaderProgramCache::Init()
                           errno);
             return false;
         }
+    }
+    else
+    {
+        RemoveStaleTemporaries(m_cacheDirectory); // of processes that were ended while they wrote
     }
     m_initialized = true;
     return true;

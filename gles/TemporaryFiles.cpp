@@ -1,0 +1,94 @@
+#include "gles/TemporaryFiles.h"
+
+#include <atomic>
+#include <cerrno>
+#include <charconv>
+#include <csignal>
+#include <memory>
+#include <optional>
+#include <string_view>
+
+#include <dirent.h>
+#include <fcntl.h>
+#include <unistd.h>
+
+namespace Nib
+{
+
+namespace
+{
+
+constexpr std::string_view kShaderPrefix = "sh";
+constexpr std::string_view kShaderSuffix = ".dat.";
+constexpr std::string_view kTemporarySuffix = ".tmp";
+
+// Takes @p text off the front of @p name; false when it does not begin so.
+bool Skip(std::string_view& name, std::string_view text)
+{
+    if (name.substr(0, text.size()) != text)
+        return false;
+    name.remove_prefix(text.size());
+    return true;
+}
+
+// Takes a decimal number without a sign off the front of @p name.
+template <typename Number>
+std::optional<Number> SkipNumber(std::string_view& name)
+{
+    Number number{};
+    if (name.empty() || name.front() < '0' || name.front() > '9')
+        return std::nullopt;
+    const auto [end, error] = std::from_chars(name.data(), name.data() + name.size(), number);
+    if (error != std::errc())
+        return std::nullopt;
+    name.remove_prefix(static_cast<std::size_t>(end - name.data()));
+    return number;
+}
+
+// The process that writes or wrote the file; nothing for a name that is none of TemporaryName's.
+std::optional<pid_t> WriterOf(std::string_view name)
+{
+    if (!Skip(name, kShaderPrefix) || !SkipNumber<unsigned long>(name) ||
+        !Skip(name, kShaderSuffix))
+        return std::nullopt;
+    const std::optional<pid_t> writer = SkipNumber<pid_t>(name);
+    if (!writer || *writer == 0 || !Skip(name, ".") || !SkipNumber<unsigned>(name) ||
+        name != kTemporarySuffix)
+        return std::nullopt;
+    return writer;
+}
+
+bool HasEnded(pid_t process)
+{
+    return process == getpid() || (kill(process, 0) != 0 && errno == ESRCH);
+}
+
+struct CloseFolder
+{
+    void operator()(DIR* folder) const { closedir(folder); }
+};
+
+} // namespace
+
+std::string TemporaryName(const std::string& path)
+{
+    static std::atomic<unsigned> counter{0};
+    return path + "." + std::to_string(getpid()) + "." +
+           std::to_string(counter.fetch_add(1, std::memory_order_relaxed)) +
+           std::string(kTemporarySuffix);
+}
+
+void RemoveStaleTemporaries(const std::string& directory)
+{
+    const std::unique_ptr<DIR, CloseFolder> folder(opendir(directory.c_str()));
+    if (!folder)
+        return;
+    while (const dirent* const entry = readdir(folder.get()))
+    {
+        const std::optional<pid_t> writer = WriterOf(entry->d_name);
+        if (writer && HasEnded(*writer))
+            unlinkat(dirfd(folder.get()), entry->d_name, 0); // what stays harms nobody
+    }
+}
+
+} // namespace Nib
