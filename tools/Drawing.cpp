@@ -3,6 +3,8 @@
 #include "FrontBuffer.h"
 #include "PageExport.h"
 #include "PngFile.h"
+#include "Recordings.h"
+#include "RenderThreads.h"
 #include "UserError.h"
 
 #include <chrono>
@@ -15,39 +17,6 @@ namespace
 {
 
 constexpr Ink::Colour kPaper{1.0f, 1.0f, 1.0f, 1.0f};
-
-/// All files as one recording, each behind the one before.
-Ink::Recording ReadRecordings(const std::vector<std::string>& files)
-{
-    Ink::Recording all;
-    double end = 0.0;
-    for (const std::string& file : files)
-    {
-        Ink::Recording one = Ink::ReadRecording(file);
-        const double shift = end - one.strokes.front().front().time;
-        for (Ink::Stroke& stroke : one.strokes)
-        {
-            for (Ink::Sample& sample : stroke)
-                sample.time += shift;
-            end = stroke.back().time;
-            all.strokes.push_back(std::move(stroke));
-        }
-    }
-    return all;
-}
-
-void CheckEgl()
-{
-    if (Nib::Egl::GetEglStatus() != 0 || !Nib::Egl::GetInstance()->GetConfig(false))
-        throw UserError("EGL does not start here: no driver, or none with an RGBA8888 "
-                        "configuration (NIB_LOG=info tells more)");
-}
-
-void CheckFor(const std::string& failure)
-{
-    if (!failure.empty())
-        throw UserError("drawing failed: " + failure);
-}
 
 void Print(const Figures& figures)
 {
@@ -82,7 +51,7 @@ void Drawing::Run()
         setenv("EGL_PLATFORM", "surfaceless", 0); // no display server is needed
     CheckEgl();
 
-    const std::unique_ptr<Nib::RenderThreadGL> parent = StartWindowThread();
+    const std::unique_ptr<Nib::RenderThreadGL> parent = StartSurfaceThread();
     std::unique_ptr<Nib::RenderThreadGL> child; // ended before its parent
     if (m_loseContextEvery != 0)
         child.reset(
@@ -92,15 +61,6 @@ void Drawing::Run()
     if (child && !child->Start())
         throw UserError("the render thread does not start");
     DrawOn(child ? *child : *parent, *parent, window.get());
-}
-
-std::unique_ptr<Nib::RenderThreadGL> Drawing::StartWindowThread() const
-{
-    std::unique_ptr<Nib::RenderThreadGL> thread(
-        Nib::RendererFactory::CreateSurfaceRenderer("nib draw", Nib::RenderThreadGL::High));
-    if (!thread->Start())
-        throw UserError("the render thread does not start");
-    return thread;
 }
 
 void Drawing::DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent,
@@ -113,13 +73,13 @@ void Drawing::DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent,
     Ink::InkSession session(thread, m_size.width, m_size.height, kPaper);
     if (window)
         session.AttachWindow(window->NativeWindow());
-    CheckFor(session.Error());
+    CheckDrawn(session.Error());
     if (pages)
         pages->Start(m_recording, m_placement, m_style, m_size, kPaper);
     const Figures figures = Play(session, window);
-    CheckFor(session.Error());
+    CheckDrawn(session.Error());
     if (pages)
-        CheckFor(pages->Finish());
+        CheckDrawn(pages->Finish());
     if (!m_options.output.empty())
         WritePng(m_options.output, session.ReadPixels(), m_size.width, m_size.height);
     Print(figures);

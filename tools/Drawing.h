@@ -20,7 +20,6 @@ public:
     void Run();
 
 private:
-    std::unique_ptr<Nib::RenderThreadGL> StartWindowThread() const;
     void DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent, XWindow* window) const;
     Figures Play(Ink::InkSession& session, XWindow* window) const;
 

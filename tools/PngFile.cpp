@@ -1,14 +1,9 @@
 #include "PngFile.h"
 
-#include "UserError.h"
+#include "ReplacementFile.h"
 
 #include <cerrno>
-#include <cstdio>
-#include <cstring>
-#include <memory>
 #include <png.h>
-#include <sys/stat.h>
-#include <unistd.h>
 
 namespace
 {
@@ -28,55 +23,6 @@ std::vector<std::uint8_t> WithStraightAlpha(std::vector<std::uint8_t> pixels)
     }
     return pixels;
 }
-
-/// A new file beside the one that it will replace; removed unless it took that one's place.
-class ReplacementFile
-{
-public:
-    explicit ReplacementFile(const std::string& path) : m_path(path), m_name(path + ".XXXXXX")
-    {
-        const int descriptor = mkstemp(m_name.data());
-        if (descriptor < 0)
-            Fail();
-        const mode_t mask = umask(0);
-        umask(mask);
-        fchmod(descriptor, 0666 & ~mask); // mkstemp makes files that only the owner reads
-        m_file = fdopen(descriptor, "wb");
-        if (!m_file)
-            Fail();
-    }
-    ReplacementFile(const ReplacementFile&) = delete;
-    ReplacementFile& operator=(const ReplacementFile&) = delete;
-    ~ReplacementFile()
-    {
-        if (m_file)
-            std::fclose(m_file);
-        if (!m_isInPlace)
-            unlink(m_name.c_str());
-    }
-
-    std::FILE* Stream() const { return m_file; }
-
-    void TakePlace()
-    {
-        std::FILE* const file = m_file;
-        m_file = nullptr;
-        if (std::fclose(file) != 0 || std::rename(m_name.c_str(), m_path.c_str()) != 0)
-            Fail();
-        m_isInPlace = true;
-    }
-
-    [[noreturn]] void Fail() const
-    {
-        throw UserError(m_path + ":1: cannot be written: " + std::strerror(errno));
-    }
-
-private:
-    std::string m_path;
-    std::string m_name;
-    std::FILE* m_file = nullptr;
-    bool m_isInPlace = false;
-};
 
 } // namespace
 
