@@ -19,8 +19,8 @@ public:
     explicit InkDocument(Recording opened);
 
     void Begin(const Sample& sample); ///< the pen comes down; an unfinished stroke ends before
-    void Add(const Sample& sample);   ///< the pen moves on; nothing unless a stroke is being written
-    void End();                       ///< the pen goes up
+    void Add(const Sample& sample); ///< the pen moves on; nothing unless a stroke is being written
+    void End();                     ///< the pen goes up
     bool IsWriting() const { return m_isWriting; }
 
     /// Takes the last step back: a stroke, also the one that is being written, or a Clear. False

@@ -48,8 +48,8 @@ void AppendSample(std::string& text, const Sample& sample)
 
 void AppendTrace(std::string& text, const Stroke& stroke, bool isAbove)
 {
-    text += isAbove ? "  <trace contextRef=\"#pen\" type=\"penUp\">"
-                    : "  <trace contextRef=\"#pen\">";
+    text +=
+        isAbove ? "  <trace contextRef=\"#pen\" type=\"penUp\">" : "  <trace contextRef=\"#pen\">";
     for (const Sample& sample : stroke)
     {
         if (&sample != stroke.data())

@@ -1,5 +1,5 @@
-#include "InkMl.h"
 #include "InkMlWriter.h"
+#include "InkMl.h"
 
 #include <gtest/gtest.h>
 #include <limits>
@@ -38,12 +38,14 @@ void ExpectReadsBack(const Ink::Recording& recording)
 TEST(InkMlWriter, WritesATraceAStroke)
 {
     Ink::Recording recording;
-    recording.strokes = {{{0.25, 1.5f, 2.0f, 0.75f, 60.0f, 45.0f}, {0.5, 3.0f, 4.0f, 1.0f, 90.0f, 0.0f}},
-                         {{1.0, 5.0f, 6.0f, 0.5f, 90.0f, 0.0f}}};
+    recording.strokes = {
+        {{0.25, 1.5f, 2.0f, 0.75f, 60.0f, 45.0f}, {0.5, 3.0f, 4.0f, 1.0f, 90.0f, 0.0f}},
+        {{1.0, 5.0f, 6.0f, 0.5f, 90.0f, 0.0f}}};
     const std::string text = Ink::ToInkMl(recording);
-    EXPECT_NE(text.find("  <trace contextRef=\"#pen\">1.5 2 0.75 0.25 45 60, 3 4 1 0.5 0 90</trace>\n"
-                        "  <trace contextRef=\"#pen\">5 6 0.5 1 0 90</trace>\n</ink>\n"),
-              std::string::npos)
+    EXPECT_NE(
+        text.find("  <trace contextRef=\"#pen\">1.5 2 0.75 0.25 45 60, 3 4 1 0.5 0 90</trace>\n"
+                  "  <trace contextRef=\"#pen\">5 6 0.5 1 0 90</trace>\n</ink>\n"),
+        std::string::npos)
         << text;
     ExpectReadsBack(recording);
 }
