@@ -2,6 +2,8 @@
 #include "Recording.h"
 #include "UserError.h"
 
+#include <nib/version.h>
+
 #include <CLI/CLI.hpp>
 
 #include <cstdio>
@@ -26,7 +28,7 @@ int main(int argc, char** argv)
     // The library's own log lines are for its developers; NIB_LOG brings them back.
     setenv("NIB_LOG", "silent", 0);
     CLI::App app("Draw with NibRenderer from the command line", "nib");
-    app.set_version_flag("--version", std::string("nib ") + NIB_VERSION);
+    app.set_version_flag("--version", std::string("nib ") + Nib::GetVersionString());
     app.require_subcommand(1);
     AddDrawCommand(app);
     try

@@ -25,6 +25,7 @@
 #include <nib/shader_manager.h>
 #include <nib/task.h>
 #include <nib/texture.h>
+#include <nib/version.h>
 #include <nib/worker_thread.h>
 
 #endif

@@ -1,25 +1,26 @@
 # One step of the package's test; see CMakeLists.txt beside it for the variables.
 
-function(run)
-    execute_process(COMMAND ${ARGN} RESULT_VARIABLE result OUTPUT_VARIABLE output
-        ERROR_VARIABLE errors)
-    message(STATUS "${output}${errors}")
-    if(NOT result EQUAL 0)
-        list(JOIN ARGN " " command)
-        message(FATAL_ERROR "${command}: ${result}")
-    endif()
-    set(output "${output}" PARENT_SCOPE)
-endfunction()
-
-function(expect_output text)
-    if(NOT output MATCHES "${text}")
-        message(FATAL_ERROR "expected \"${text}\" in: ${output}")
-    endif()
-endfunction()
+include(${CMAKE_CURRENT_LIST_DIR}/Run.cmake)
 
 # What a test draws is drawn without a window system, and cached beside the test.
 set(environment ${CMAKE_COMMAND} -E env --unset=DISPLAY --unset=LD_LIBRARY_PATH
     EGL_PLATFORM=surfaceless NIB_CACHE_DIR=${WORK}/cache/sdk)
+
+function(run_consumers folder)
+    run(${environment} ${folder}/consumer)
+    expect_output("consumer: ok")
+    run(${environment} ${folder}/base_consumer)
+    expect_output("base consumer: ok")
+endfunction()
+
+# Builds the programs of somebody who has the installation below a prefix, and runs them.
+function(use_prefix prefix)
+    run(${CMAKE_COMMAND} -S ${CONSUMER} -B ${WORK}/use -G ${GENERATOR}
+        -DCMAKE_CXX_COMPILER=${COMPILER} -DCMAKE_PREFIX_PATH=${prefix}
+        -DCMAKE_FIND_USE_PACKAGE_REGISTRY=OFF)
+    run(${CMAKE_COMMAND} --build ${WORK}/use)
+    run_consumers(${WORK}/use)
+endfunction()
 
 if(STEP STREQUAL "install")
     separate_arguments(targets UNIX_COMMAND "${TARGETS}")
@@ -56,14 +57,7 @@ elseif(STEP STREQUAL "files")
 
 elseif(STEP STREQUAL "find_package")
     file(REMOVE_RECURSE ${WORK})
-    run(${CMAKE_COMMAND} -S ${CONSUMER} -B ${WORK} -G ${GENERATOR}
-        -DCMAKE_CXX_COMPILER=${COMPILER} -DCMAKE_PREFIX_PATH=${PREFIX}
-        -DCMAKE_FIND_USE_PACKAGE_REGISTRY=OFF)
-    run(${CMAKE_COMMAND} --build ${WORK})
-    run(${environment} ${WORK}/consumer)
-    expect_output("consumer: ok")
-    run(${environment} ${WORK}/base_consumer)
-    expect_output("base consumer: ok")
+    use_prefix(${PREFIX})
 
 elseif(STEP STREQUAL "other_version")
     file(REMOVE_RECURSE ${WORK})
@@ -94,6 +88,48 @@ elseif(STEP STREQUAL "pkg_config")
         ${libs} -Wl,-rpath,${PREFIX}/${LIBDIR} -o ${WORK}/consumer)
     run(${environment} ${WORK}/consumer)
     expect_output("consumer: ok")
+
+elseif(STEP STREQUAL "subdirectory")
+    file(REMOVE_RECURSE ${WORK})
+    run(${CMAKE_COMMAND} -S ${CONSUMER} -B ${WORK} -G ${GENERATOR} -DCMAKE_CXX_FLAGS=-O0
+        -DCMAKE_CXX_COMPILER=${COMPILER} -DNIB_SOURCE=${SOURCE})
+    run(${CMAKE_COMMAND} --build ${WORK})
+    run_consumers(${WORK})
+    # The tree inside another build adds the libraries, not its tests and tools.
+    if(EXISTS ${WORK}/NibRenderer/tests OR EXISTS ${WORK}/NibRenderer/tools)
+        message(FATAL_ERROR "tests or tools are built within another project")
+    endif()
+
+elseif(STEP STREQUAL "deb")
+    need_program(dpkg-shlibdeps)
+    file(REMOVE_RECURSE ${WORK})
+    run(${CMAKE_CPACK_COMMAND} -G DEB --config ${BUILD}/CPackConfig.cmake -B ${WORK}/packages)
+    file(GLOB packages ${WORK}/packages/*.deb)
+    set(fields)
+    foreach(package IN LISTS packages)
+        run(dpkg-deb -x ${package} ${WORK}/root)
+        run(dpkg-deb -f ${package} Package Version Depends)
+        string(APPEND fields "${output}")
+    endforeach()
+    set(output "${fields}")
+    expect_output("Package: libnibrenderer1\nVersion: 1\\.0\\.0-1\nDepends: [^\n]*libegl1")
+    expect_output("Package: libnibrenderer-dev\nVersion: 1\\.0\\.0-1\nDepends: libnibrenderer1 ")
+    expect_output("Package: nib\nVersion: 1\\.0\\.0-1\nDepends: libnibrenderer1 ")
+    use_prefix(${WORK}/root/usr)
+
+elseif(STEP STREQUAL "vcpkg")
+    run(${CMAKE_COMMAND} -DPORT_DIR=${SOURCE}/packaging/vcpkg/nibrenderer -DWORK=${WORK}
+        -DGENERATOR=${GENERATOR} -DCOMPILER=${COMPILER}
+        -P ${CMAKE_CURRENT_LIST_DIR}/vcpkg/RunPort.cmake)
+    use_prefix(${WORK}/packages)
+
+elseif(STEP STREQUAL "conan")
+    need_program(python3)
+    run(${CMAKE_COMMAND} -E env PYTHONPATH=${CMAKE_CURRENT_LIST_DIR}/conan
+        PYTHONDONTWRITEBYTECODE=1 python3 ${CMAKE_CURRENT_LIST_DIR}/conan/run_recipe.py
+        ${SOURCE}/packaging/conan/conanfile.py ${WORK} ${COMPILER} ${GENERATOR})
+    expect_output("nibrenderer/1\.0\.0: ok")
+    use_prefix(${WORK}/package)
 
 elseif(STEP STREQUAL "tool")
     run(${environment} ${PREFIX}/${BINDIR}/nib --version)

@@ -1,0 +1,3 @@
+def check_min_cppstd(recipe, standard):
+    if int(recipe.settings.cppstd) < standard:
+        raise AssertionError(f"C++{standard} is wanted")

@@ -1,0 +1,88 @@
+# Runs the port's script as vcpkg does, with stand-ins for the functions of vcpkg that it calls.
+# Variables: PORT_DIR, WORK, GENERATOR, COMPILER. What it installs lies in ${WORK}/packages.
+cmake_minimum_required(VERSION 3.22)
+include(${CMAKE_CURRENT_LIST_DIR}/../Run.cmake)
+
+set(PORT nibrenderer)
+set(CURRENT_PORT_DIR ${PORT_DIR})
+set(CURRENT_PACKAGES_DIR ${WORK}/packages)
+set(calls)
+
+function(vcpkg_check_linkage)
+    if(NOT ARGV STREQUAL "ONLY_DYNAMIC_LIBRARY")
+        message(FATAL_ERROR "vcpkg_check_linkage: unknown ${ARGV}")
+    endif()
+    set(calls "${calls};linkage" PARENT_SCOPE)
+endfunction()
+
+function(vcpkg_cmake_configure)
+    cmake_parse_arguments(PARSE_ARGV 0 given "" "SOURCE_PATH" "OPTIONS")
+    if(given_UNPARSED_ARGUMENTS)
+        message(FATAL_ERROR "vcpkg_cmake_configure: unknown ${given_UNPARSED_ARGUMENTS}")
+    endif()
+    run(${CMAKE_COMMAND} -S ${given_SOURCE_PATH} -B ${WORK}/build -G ${GENERATOR}
+        -DCMAKE_CXX_COMPILER=${COMPILER} -DCMAKE_CXX_FLAGS=-O0 -DBUILD_SHARED_LIBS=ON
+        -DCMAKE_INSTALL_LIBDIR=lib -DCMAKE_INSTALL_PREFIX=${CURRENT_PACKAGES_DIR}
+        ${given_OPTIONS})
+    set(calls "${calls};configure" PARENT_SCOPE)
+endfunction()
+
+function(vcpkg_cmake_install)
+    run(${CMAKE_COMMAND} --build ${WORK}/build --target install)
+    set(calls "${calls};install" PARENT_SCOPE)
+endfunction()
+
+# Moves the CMake package to share/, as vcpkg wants it.
+function(vcpkg_cmake_config_fixup)
+    cmake_parse_arguments(PARSE_ARGV 0 given "" "PACKAGE_NAME;CONFIG_PATH" "")
+    if(given_UNPARSED_ARGUMENTS)
+        message(FATAL_ERROR "vcpkg_cmake_config_fixup: unknown ${given_UNPARSED_ARGUMENTS}")
+    endif()
+    if(NOT EXISTS ${CURRENT_PACKAGES_DIR}/${given_CONFIG_PATH}/${given_PACKAGE_NAME}Config.cmake)
+        message(FATAL_ERROR "no ${given_PACKAGE_NAME}Config.cmake in ${given_CONFIG_PATH}")
+    endif()
+    set(calls "${calls};config" PARENT_SCOPE)
+endfunction()
+
+function(vcpkg_fixup_pkgconfig)
+    if(NOT EXISTS ${CURRENT_PACKAGES_DIR}/lib/pkgconfig/nibrenderer.pc)
+        message(FATAL_ERROR "no pkg-config file")
+    endif()
+    set(calls "${calls};pkgconfig" PARENT_SCOPE)
+endfunction()
+
+function(vcpkg_install_copyright)
+    cmake_parse_arguments(PARSE_ARGV 0 given "" "" "FILE_LIST")
+    file(COPY_FILE ${given_FILE_LIST} ${CURRENT_PACKAGES_DIR}/share/${PORT}/copyright)
+    set(calls "${calls};copyright" PARENT_SCOPE)
+endfunction()
+
+file(REMOVE_RECURSE ${WORK})
+file(MAKE_DIRECTORY ${CURRENT_PACKAGES_DIR}/share)
+include(${PORT_DIR}/portfile.cmake)
+if(NOT calls STREQUAL ";linkage;configure;install;config;pkgconfig;copyright")
+    message(FATAL_ERROR "the port called${calls}")
+endif()
+foreach(file usage copyright)
+    if(NOT EXISTS ${CURRENT_PACKAGES_DIR}/share/${PORT}/${file})
+        message(FATAL_ERROR "share/${PORT}/${file} is missing")
+    endif()
+endforeach()
+
+# The manifest: vcpkg's names and forms, and the version of the tree.
+include(${PORT_DIR}/../../../cmake/NibVersion.cmake)
+file(READ ${PORT_DIR}/vcpkg.json manifest)
+string(JSON name GET "${manifest}" name)
+string(JSON version GET "${manifest}" version-semver)
+string(JSON license GET "${manifest}" license)
+if(NOT name STREQUAL PORT OR NOT version STREQUAL NIB_VERSION_TEXT OR NOT license STREQUAL "Apache-2.0")
+    message(FATAL_ERROR "vcpkg.json: ${name} ${version} ${license}")
+endif()
+string(JSON last LENGTH "${manifest}")
+math(EXPR last "${last} - 1")
+foreach(index RANGE ${last})
+    string(JSON member MEMBER "${manifest}" ${index})
+    if(NOT member MATCHES "^(name|version-semver|description|license|supports|dependencies)$")
+        message(FATAL_ERROR "vcpkg.json: unknown field ${member}")
+    endif()
+endforeach()
