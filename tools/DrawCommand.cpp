@@ -38,6 +38,15 @@ void AddDrawCommand(CLI::App& app)
                      "fit: the ink fills the page; 1:1: recorded units are pixels")
         ->check(CLI::IsMember({"fit", "1:1"}))
         ->capture_default_str();
+    draw->add_option("--brush", options->brush, "pen, marker (translucent) or stamp (textured)")
+        ->capture_default_str();
+    draw->add_option("--color", options->colour,
+                     "Of the ink: #rgb, #rrggbb, #rrggbbaa or a name such as 'red'; each brush has "
+                     "one of its own");
+    draw->add_option("--width", options->width,
+                     "Of a stroke at full pressure, in pixels; each brush has one of its own");
+    draw->add_option("--paper", options->paper, "Colour of the page, given like --color")
+        ->capture_default_str();
     draw->add_option("--speed", options->speed, "Times the recorded speed, or 'max'; for --window")
         ->capture_default_str();
     draw->add_flag("--keep", options->keep, "Leave the window open after the replay");

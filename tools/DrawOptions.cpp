@@ -10,6 +10,8 @@ namespace
 {
 
 constexpr int kLargestSide = 16384;
+constexpr float kWidest = 1000.0f;
+constexpr float kFinest = 0.1f;
 
 template <typename Number>
 std::optional<Number> ParseNumber(std::string_view text)
@@ -19,6 +21,14 @@ std::optional<Number> ParseNumber(std::string_view text)
     if (error != std::errc() || end != text.data() + text.size())
         return std::nullopt;
     return number;
+}
+
+float ParseWidth(const std::string& text)
+{
+    const std::optional<float> width = ParseNumber<float>(text);
+    if (!width || !(*width >= kFinest) || !(*width <= kWidest))
+        throw UserError("--width: '" + text + "' is not a number of pixels from 0.1 to 1000");
+    return *width;
 }
 
 } // namespace
@@ -63,4 +73,27 @@ int ParseLoseContext(const std::string& text)
             return *samples;
     }
     throw UserError("--lose-context: '" + text + "' is not every:N with N from 1");
+}
+
+Ink::BrushStyle StyleOf(const DrawOptions& options)
+{
+    const std::optional<Ink::BrushKind> kind = Ink::BrushNamed(options.brush);
+    if (!kind)
+        throw UserError("--brush: '" + options.brush + "' is none of pen, marker, stamp");
+    Ink::BrushStyle style = Ink::DefaultStyle(*kind);
+    if (options.colour)
+        style.colour = ParseColourOption("--color", *options.colour);
+    if (options.width)
+        style.width = ParseWidth(*options.width);
+    return style;
+}
+
+Ink::Colour ParseColourOption(const std::string& option, const std::string& text)
+{
+    const std::optional<Ink::Colour> colour = Ink::ParseColour(text);
+    if (!colour)
+        throw UserError(option + ": '" + text +
+                        "' is neither #rgb, #rrggbb, #rrggbbaa nor one of " +
+                        std::string(Ink::ColourNames()));
+    return *colour;
 }

@@ -1,6 +1,9 @@
 #ifndef NIB_TOOLS_DRAW_OPTIONS_H
 #define NIB_TOOLS_DRAW_OPTIONS_H
 
+#include "BrushStyle.h"
+
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -11,6 +14,10 @@ struct DrawOptions
     std::string output;
     std::string size = "1280x800";
     std::string scale = "fit";
+    std::string brush = "pen";
+    std::optional<std::string> colour; ///< else the brush's own
+    std::optional<std::string> width;  ///< else the brush's own
+    std::string paper = "white";
     std::string speed = "1";
     std::string loseContext; ///< "every:N"
     int exportedPages = 0;
@@ -33,5 +40,11 @@ double ParseSpeed(const std::string& text);
 
 /// "every:N"; 0 for an empty text. Throws UserError.
 int ParseLoseContext(const std::string& text);
+
+/// The brush with its colour and width, or its own where these are not given. Throws UserError.
+Ink::BrushStyle StyleOf(const DrawOptions& options);
+
+/// A colour, given to @p option. Throws UserError.
+Ink::Colour ParseColourOption(const std::string& option, const std::string& text);
 
 #endif

@@ -16,8 +16,6 @@
 namespace
 {
 
-constexpr Ink::Colour kPaper{1.0f, 1.0f, 1.0f, 1.0f};
-
 void Print(const Figures& figures)
 {
     std::printf("%d strokes, %d samples, %d frames\n", figures.strokes, figures.samples,
@@ -35,7 +33,8 @@ void WaitUntilClosed(XWindow& window)
 
 Drawing::Drawing(const DrawOptions& options)
     : m_options(options), m_size(ParseSize(options.size)), m_speed(ParseSpeed(options.speed)),
-      m_loseContextEvery(ParseLoseContext(options.loseContext)),
+      m_loseContextEvery(ParseLoseContext(options.loseContext)), m_style(StyleOf(options)),
+      m_paper(ParseColourOption("--paper", options.paper)),
       m_recording(ReadRecordings(options.files))
 {
     if (options.scale == "fit")
@@ -70,12 +69,12 @@ void Drawing::DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent,
     if (m_options.exportedPages != 0)
         pages.emplace(parent, m_options.output, m_options.exportedPages);
 
-    Ink::InkSession session(thread, m_size.width, m_size.height, kPaper);
+    Ink::InkSession session(thread, m_size.width, m_size.height, m_paper);
     if (window)
         session.AttachWindow(window->NativeWindow());
     CheckDrawn(session.Error());
     if (pages)
-        pages->Start(m_recording, m_placement, m_style, m_size, kPaper);
+        pages->Start(m_recording, m_placement, m_style, m_size, m_paper);
     const Figures figures = Play(session, window);
     CheckDrawn(session.Error());
     if (pages)

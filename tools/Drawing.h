@@ -1,9 +1,9 @@
 #ifndef NIB_TOOLS_DRAWING_H
 #define NIB_TOOLS_DRAWING_H
 
+#include "BrushStyle.h"
 #include "DrawOptions.h"
 #include "InkSession.h"
-#include "PenStyle.h"
 #include "Recording.h"
 #include "Replay.h"
 #include "XWindow.h"
@@ -27,9 +27,10 @@ private:
     PageSize m_size;
     double m_speed;
     int m_loseContextEvery;
+    Ink::BrushStyle m_style;
+    Ink::Colour m_paper;
     Ink::Recording m_recording;
     Ink::Placement m_placement;
-    Ink::PenStyle m_style;
 };
 
 #endif

@@ -23,7 +23,7 @@ PageExport::~PageExport()
 }
 
 void PageExport::Start(const Ink::Recording& recording, const Ink::Placement& placement,
-                       const Ink::PenStyle& style, PageSize size, const Ink::Colour& paper)
+                       const Ink::BrushStyle& style, PageSize size, const Ink::Colour& paper)
 {
     m_poster = std::thread(
         [=, this, &recording]

@@ -1,9 +1,8 @@
 #ifndef NIB_TOOLS_PAGE_EXPORT_H
 #define NIB_TOOLS_PAGE_EXPORT_H
 
+#include "BrushStyle.h"
 #include "DrawOptions.h"
-#include "InkPainter.h"
-#include "PenStyle.h"
 #include "Recording.h"
 
 #include <nib/nib.h>
@@ -27,7 +26,7 @@ public:
 
     /// Begins; the recording must stay until Finish.
     void Start(const Ink::Recording& recording, const Ink::Placement& placement,
-               const Ink::PenStyle& style, PageSize size, const Ink::Colour& paper);
+               const Ink::BrushStyle& style, PageSize size, const Ink::Colour& paper);
 
     /// [blocks] until all pages are written. What went wrong, or an empty text.
     std::string Finish();

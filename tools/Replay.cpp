@@ -1,8 +1,9 @@
 #include "Replay.h"
 
+#include "InkStroke.h"
+
 #include <chrono>
 #include <thread>
-#include <utility>
 
 namespace
 {
@@ -33,16 +34,14 @@ private:
 } // namespace
 
 Figures Replay(Ink::InkSession& session, const Ink::Recording& recording,
-               const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace)
+               const Ink::Placement& placement, const Ink::BrushStyle& style, const Pace& pace)
 {
     const double firstTime = recording.strokes.front().front().time;
     const Pacer pacer(pace.speed, firstTime);
-    Ink::StrokeMesh mesh;
-    std::vector<Ink::Vertex> piece;
     Figures figures;
-    const auto draw = [&]
+    const auto draw = [&](Ink::InkStroke& ink)
     {
-        session.Draw(std::exchange(piece, {}), style.colour);
+        session.Draw(ink.Take());
         if (!pace.framePerSample)
             return;
         session.Present();
@@ -51,18 +50,18 @@ Figures Replay(Ink::InkSession& session, const Ink::Recording& recording,
     for (const Ink::Stroke& stroke : recording.strokes)
     {
         ++figures.strokes;
-        mesh.Begin();
+        Ink::InkStroke ink(style);
         for (const Ink::Sample& sample : stroke)
         {
             if (pace.isWanted && !pace.isWanted())
                 return figures;
             pacer.WaitFor(sample.time);
             ++figures.samples;
-            mesh.Add(Ink::ToPage(sample, placement, style), piece);
+            ink.Add(Ink::ToPage(sample, placement, style));
             if (&sample == &stroke.back())
-                mesh.End(piece);
+                ink.End();
             if (pace.framePerSample || pace.afterSample || &sample == &stroke.back())
-                draw();
+                draw(ink);
             if (pace.afterSample)
                 pace.afterSample(figures.samples);
         }

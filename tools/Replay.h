@@ -1,8 +1,8 @@
 #ifndef NIB_TOOLS_REPLAY_H
 #define NIB_TOOLS_REPLAY_H
 
+#include "BrushStyle.h"
 #include "InkSession.h"
-#include "PenStyle.h"
 #include "Recording.h"
 
 #include <functional>
@@ -27,6 +27,6 @@ struct Figures
 /// Draws @p recording into @p session, sample by sample, to its end or until it is no longer
 /// wanted.
 Figures Replay(Ink::InkSession& session, const Ink::Recording& recording,
-               const Ink::Placement& placement, const Ink::PenStyle& style, const Pace& pace);
+               const Ink::Placement& placement, const Ink::BrushStyle& style, const Pace& pace);
 
 #endif

@@ -1,5 +1,7 @@
 #include "InkSession.h"
 
+#include "InkPainter.h"
+
 #include <algorithm>
 #include <exception>
 #include <utility>
@@ -9,7 +11,7 @@ namespace Ink
 
 struct InkSession::GlState
 {
-    std::unique_ptr<InkPainter> painter;
+    InkPainter painter;
     std::unique_ptr<Page> page;
     std::unique_ptr<PageView> view;
     std::string error;
@@ -39,12 +41,8 @@ InkSession::InkSession(Nib::RenderThreadGL& thread, int width, int height, const
     : m_thread(thread), m_width(width), m_height(height), m_gl(std::make_shared<GlState>()),
       m_dirty(0.0f, 0.0f, static_cast<float>(width), static_cast<float>(height))
 {
-    PostGuarded(
-        [width, height, paper](GlState& gl)
-        {
-            gl.painter = std::make_unique<InkPainter>();
-            gl.page = std::make_unique<Page>(width, height, paper);
-        });
+    PostGuarded([width, height, paper](GlState& gl)
+                { gl.page = std::make_unique<Page>(width, height, paper); });
 }
 
 InkSession::~InkSession()
@@ -54,7 +52,7 @@ InkSession::~InkSession()
          {
              gl->view.reset();
              gl->page.reset();
-             gl->painter.reset();
+             gl->painter = InkPainter();
              Nib::ResourceChecker::leakCheckLookup(true); // in engineering builds
          });
     m_thread.GetMsgQueue()->waitForCompleting();
@@ -68,13 +66,12 @@ void InkSession::AttachWindow(void* window)
     m_dirty.Set(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
 }
 
-void InkSession::Draw(std::vector<Vertex> triangles, const Colour& colour)
+void InkSession::Draw(InkPiece piece)
 {
-    if (triangles.empty())
+    if (piece.IsEmpty())
         return;
-    m_dirty.Union(Bounds(triangles));
-    PostGuarded([triangles = std::move(triangles), colour](GlState& gl)
-                { gl.page->Draw(*gl.painter, triangles, colour); });
+    m_dirty.Union(piece.Bounds());
+    PostGuarded([piece = std::move(piece)](GlState& gl) { gl.painter.Paint(piece, *gl.page); });
 }
 
 void InkSession::Present()
@@ -96,21 +93,20 @@ void InkSession::Present()
 
 void InkSession::LoseContext()
 {
-    auto pixels = std::make_shared<std::vector<std::uint8_t>>();
     PostGuarded(
-        [pixels](GlState& gl)
+        [](GlState& gl)
         {
-            *pixels = gl.page->Suspend();
-            gl.painter->ForgetContents();
+            gl.page->Suspend();
+            gl.painter.Suspend();
         });
     m_thread.OnPause(); // behind the task above; the objects let go of their GL names
 
     m_thread.OnResume(); // the objects get new names, their contents are ours to bring
     PostGuarded(
-        [pixels](GlState& gl)
+        [](GlState& gl)
         {
-            gl.page->Resume(*pixels);
-            gl.painter->RestoreContents();
+            gl.page->Resume();
+            gl.painter.Resume();
         });
     m_thread.GetMsgQueue()->waitForCompleting(); // OnResume itself does not wait for the context
 }
@@ -127,16 +123,6 @@ std::string InkSession::Error()
 {
     m_thread.GetMsgQueue()->waitForCompleting();
     return m_gl->error;
-}
-
-Nib::RectF Bounds(const std::vector<Vertex>& triangles)
-{
-    if (triangles.empty())
-        return Nib::RectF();
-    Nib::RectF box(triangles[0].x, triangles[0].y, triangles[0].x, triangles[0].y);
-    for (const Vertex& vertex : triangles)
-        box.MakeRect(vertex.x, vertex.y);
-    return box;
 }
 
 } // namespace Ink

@@ -1,6 +1,7 @@
 #ifndef INK_INK_SESSION_H
 #define INK_INK_SESSION_H
 
+#include "InkPiece.h"
 #include "Page.h"
 #include "PageView.h"
 
@@ -31,8 +32,8 @@ public:
     /// Shows the page in @p window, which has the page's size. [blocks]
     void AttachWindow(void* window);
 
-    /// Draws a piece of ink onto the page; it is not shown yet. Never blocks.
-    void Draw(std::vector<Vertex> triangles, const Colour& colour);
+    /// Paints a piece of a stroke onto the page; it is not shown yet. Never blocks.
+    void Draw(InkPiece piece);
 
     /// Shows what changed since the last frame. [blocks] until the frame is presented.
     void Present();
@@ -59,9 +60,6 @@ private:
     std::shared_ptr<GlState> m_gl; // its contents are touched on the render thread alone
     Nib::RectF m_dirty;            // page pixels, y downward; what changed since the last frame
 };
-
-/// The box around @p triangles, in the same units. Empty for none.
-Nib::RectF Bounds(const std::vector<Vertex>& triangles);
 
 } // namespace Ink
 

@@ -1,9 +1,11 @@
 #include "Page.h"
 
+#include <array>
+
 namespace Ink
 {
 
-Page::Page(int width, int height, const Colour& paper) : m_paper(paper)
+Page::Page(int width, int height, const Colour& paper, const char* tag) : m_paper(paper)
 {
     Nib::TextureDescriptor descriptor;
     descriptor.width = width;
@@ -15,38 +17,30 @@ Page::Page(int width, int height, const Colour& paper) : m_paper(paper)
         Nib::kTextureFilterNearest,
     };
     m_texture.Reset(
-        Nib::RendererFactory::CreateTextureObject(descriptor, nullptr, nearest, 2, nullptr),
-        "page");
+        Nib::RendererFactory::CreateTextureObject(descriptor, nullptr, nearest, 2, nullptr), tag);
     m_target.reset(Nib::RendererFactory::CreateOffscreenRenderTarget(&*m_texture));
     Clear();
 }
 
 void Page::Clear()
 {
-    m_target->ClearColor(m_paper.red * m_paper.alpha, m_paper.green * m_paper.alpha,
-                         m_paper.blue * m_paper.alpha, m_paper.alpha);
+    const std::array<float, 4> paper = Premultiplied(m_paper);
+    m_target->ClearColor(paper[0], paper[1], paper[2], paper[3]);
 }
 
-std::vector<std::uint8_t> Page::Suspend()
+void Page::Suspend()
 {
-    std::vector<std::uint8_t> pixels = ReadPixels();
+    m_suspended = ReadPixels();
     m_target.reset();
     m_texture.Forget();
-    return pixels;
 }
 
-void Page::Resume(const std::vector<std::uint8_t>& pixels)
+void Page::Resume()
 {
     m_texture.Remember();
-    m_texture->Update(pixels.data(), 0);
+    m_texture->Update(m_suspended.data(), 0);
+    m_suspended = {};
     m_target.reset(Nib::RendererFactory::CreateOffscreenRenderTarget(&*m_texture));
-}
-
-void Page::Draw(InkPainter& painter, const std::vector<Vertex>& triangles, const Colour& colour)
-{
-    m_target->Activate();
-    painter.Draw(triangles, colour, Width(), Height());
-    m_target->Deactivate(true, true);
 }
 
 std::vector<std::uint8_t> Page::ReadPixels()

@@ -35,12 +35,12 @@ constexpr float kCorners[] = {0, 0, 1, 0, 0, 1, 1, 1};
 
 } // namespace
 
-PageView::PageView(int width, int height) : m_height(height)
+PageView::PageView(int width, int height)
+    : m_height(height), m_program(kVertexShader, kFragmentShader)
 {
     using Factory = Nib::RendererFactory;
     m_window.reset(Factory::CreateRenderTargetFromDefault(width, height));
-    m_program.reset(Factory::CreateShaderProgram(kVertexShader, kFragmentShader, nullptr));
-    m_pageUnit.reset(m_program->GetBindingIntf("u_page"));
+    m_pageUnit = m_program.Binding("u_page");
 
     Nib::VertexDescriptor corner;
     corner.addAttribute(Nib::VertexDescriptor::AttributeType::Float, 2,
@@ -58,7 +58,7 @@ void PageView::Draw(Nib::ITextureObject& page, const Nib::RectF& dirty)
     if (!m_isFirst && BackBufferIsKept())
         LimitTo(dirty);
     m_isFirst = false;
-    m_program->Activate();
+    m_program.Activate();
     m_pageUnit->SetValue(&kPageUnit);
     page.Activate(kPageUnit);
     m_blending->Activate();

@@ -2,6 +2,7 @@
 #define INK_PAGE_VIEW_H
 
 #include "PostTask.h"
+#include "Program.h"
 
 #include <nib/nib.h>
 
@@ -26,8 +27,8 @@ private:
 
     int m_height;
     bool m_isFirst = true;
+    Program m_program;
     Owned<Nib::IRenderTarget> m_window;
-    Owned<Nib::IShaderProgram> m_program;
     Owned<Nib::IParameterBinding> m_pageUnit;
     Owned<Nib::IGraphicsObject> m_quad;
     Owned<Nib::IBlendStateObject> m_blending;

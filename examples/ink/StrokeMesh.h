@@ -1,7 +1,8 @@
 #ifndef INK_STROKE_MESH_H
 #define INK_STROKE_MESH_H
 
-#include <cstddef>
+#include "StrokeCurve.h"
+
 #include <vector>
 
 namespace Ink
@@ -16,18 +17,9 @@ struct Vertex
 };
 static_assert(sizeof(Vertex) == 3 * sizeof(float), "uploaded as it stands");
 
-/// A point of a stroke on the page.
-struct PenPoint
-{
-    float x = 0.0f;      ///< page pixels, to the right
-    float y = 0.0f;      ///< page pixels, downward
-    float radius = 1.0f; ///< half the width of the stroke here, in pixels
-};
-
 /// Turns the points of one stroke, as they arrive, into triangles: a band of varying width along
-/// the centripetal Catmull-Rom curve through the points, with round caps, and round joins where the
-/// curve turns sharply. Each call appends the triangles that have become certain; the curve up to
-/// the newest point follows with the next point or with End, since its direction depends on it.
+/// the curve through the points, with round caps, and round joins where the curve turns sharply.
+/// Each call appends the triangles that have become certain (StrokeCurve).
 ///
 /// The outline lies half a pixel inside the outermost corners, so that the shader can fade the edge
 /// over one pixel from `inside`.
@@ -52,13 +44,12 @@ private:
         float normalY = 0.0f;
     };
 
-    void AddCurve(const PenPoint& before, const PenPoint& from, const PenPoint& to,
-                  const PenPoint& after, std::vector<Vertex>& triangles);
-    void AddSection(const PenPoint& centre, float directionX, float directionY,
-                    std::vector<Vertex>& triangles);
+    void AddPlaces(std::vector<Vertex>& triangles);
+    void AddSection(const CurvePlace& place, std::vector<Vertex>& triangles);
 
-    std::vector<PenPoint> m_recent; ///< the last points, at most three
-    Section m_last;                 ///< where the band ends so far
+    StrokeCurve m_curve;
+    std::vector<CurvePlace> m_places; ///< of the call that is running; kept for its memory
+    Section m_last;                   ///< where the band ends so far
     bool m_hasSection = false;
 };
 

@@ -1,5 +1,5 @@
 #include "StrokeMesh.h"
-#include "PenStyle.h"
+#include "BrushStyle.h"
 
 #include <algorithm>
 #include <cmath>
@@ -134,7 +134,7 @@ TEST(StrokeMesh, AnyPositionGivesFiniteTriangles)
         EXPECT_TRUE(std::isfinite(vertex.x) && std::isfinite(vertex.y));
 }
 
-TEST(PenStyle, FitLeavesAMarginOnTheTighterSide)
+TEST(BrushStyle, FitLeavesAMarginOnTheTighterSide)
 {
     Ink::Recording recording;
     recording.strokes = {{{0, 100, 200, 0.5f}, {1, 300, 250, 0.5f}}};
@@ -145,9 +145,9 @@ TEST(PenStyle, FitLeavesAMarginOnTheTighterSide)
     EXPECT_FLOAT_EQ(225 * placement.scale + placement.offsetY, 500.0f);
 }
 
-TEST(PenStyle, PressureSetsTheWidth)
+TEST(BrushStyle, PressureSetsTheWidth)
 {
-    const Ink::PenStyle style{{}, 10.0f};
+    const Ink::BrushStyle style{Ink::BrushKind::Pen, {}, 10.0f};
     EXPECT_FLOAT_EQ(Ink::ToPage({0, 1, 2, 1.0f}, {}, style).radius, 5.0f);
     EXPECT_FLOAT_EQ(Ink::ToPage({0, 1, 2, 0.5f}, {}, style).radius, 3.0f);
     EXPECT_FLOAT_EQ(Ink::ToPage({0, 1, 2, 0.0f}, {}, style).radius, 1.0f);

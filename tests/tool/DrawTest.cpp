@@ -1,4 +1,4 @@
-#include "PenStyle.h"
+#include "BrushStyle.h"
 #include "Picture.h"
 #include "Recording.h"
 #include "RunNib.h"
@@ -23,7 +23,7 @@ class PenWay
 public:
     PenWay(const Ink::Recording& recording, const Ink::Placement& placement)
     {
-        const Ink::PenStyle style;
+        const Ink::BrushStyle style;
         for (const Ink::Stroke& stroke : recording.strokes)
         {
             m_strokes.emplace_back();

@@ -1,4 +1,4 @@
-#include "PenStyle.h"
+#include "Placement.h"
 
 #include <algorithm>
 #include <limits>
@@ -8,9 +8,7 @@ namespace Ink
 namespace
 {
 
-constexpr float kMargin = 0.05f;   // of the page, on each side
-constexpr float kLightest = 0.2f;  // of the full width, when the pen barely touches
-constexpr float kThinnest = 0.35f; // pixels; below it a stroke breaks into dots
+constexpr float kMargin = 0.05f; // of the page, on each side
 
 } // namespace
 
@@ -42,14 +40,6 @@ Placement FitToPage(const Recording& recording, int width, int height)
     const float middleX = left / 2.0f + right / 2.0f;
     const float middleY = top / 2.0f + bottom / 2.0f;
     return {scale, pageWidth / 2.0f - middleX * scale, pageHeight / 2.0f - middleY * scale};
-}
-
-PenPoint ToPage(const Sample& sample, const Placement& placement, const PenStyle& style)
-{
-    const float share = kLightest + (1.0f - kLightest) * std::clamp(sample.pressure, 0.0f, 1.0f);
-    return {sample.x * placement.scale + placement.offsetX,
-            sample.y * placement.scale + placement.offsetY,
-            std::max(style.width * share / 2.0f, kThinnest)};
 }
 
 } // namespace Ink
