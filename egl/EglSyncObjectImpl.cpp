@@ -83,7 +83,7 @@ EglSyncObject::WaitResult EglSyncObjectImpl::Wait() const
 
 EglSyncObject::WaitResult EglSyncObjectImpl::WaitTimeout(uint64_t timeoutNs) const
 {
-    NIB_FUNCTION("virtual Nib::EglSyncObject::WaitResult "
+    NIB_FUNCTION("virtual EglSyncObject::WaitResult "
                  "Nib::EglSyncObjectImpl::WaitTimeout(uint64_t) const");
     if (m_sync == EGL_NO_SYNC_KHR)
     {
@@ -111,7 +111,7 @@ EglSyncObject::WaitResult EglSyncObjectImpl::WaitTimeout(uint64_t timeoutNs) con
 
 EglSyncObject::ObjectState EglSyncObjectImpl::GetState() const
 {
-    NIB_FUNCTION("virtual Nib::EglSyncObject::ObjectState "
+    NIB_FUNCTION("virtual EglSyncObject::ObjectState "
                  "Nib::EglSyncObjectImpl::GetState() const");
     if (m_sync == EGL_NO_SYNC_KHR)
     {

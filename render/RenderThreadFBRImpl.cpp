@@ -72,7 +72,7 @@ void RenderThreadFBRImpl::GetContextAndResume(ContextHandshake::Worker worker,
 // NOLINTEND(performance-unnecessary-value-param)
 {
     NIB_FUNCTION("static void Nib::GLES::RenderThreadFBRImpl::GetContextAndResume("
-                 "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>)");
+                 "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>)");
     ContextHandshake::HandOver(*worker, *cell, function);
 }
 

@@ -33,7 +33,7 @@ EglContext::Priority ContextPriority(RenderThreadGL::RenderPriority priority)
 RenderThreadGL* CreateSurfaceRenderer(const char* name, RenderThreadGL::RenderPriority priority)
 {
     NIB_FUNCTION("Nib::RenderThreadGL *Nib::GLES::CreateSurfaceRenderer(const char *, "
-                 "Nib::RenderThreadGL::RenderPriority)");
+                 "RenderThreadGL::RenderPriority)");
     NIB_LOG_INFO("%s", function);
     return new RenderThreadGLImpl(name, priority);
 }

@@ -79,7 +79,7 @@ void RenderThreadOffscreenGLImpl::GetContextAndResume(ContextHandshake::Worker w
 // NOLINTEND(performance-unnecessary-value-param)
 {
     NIB_FUNCTION("static void Nib::GLES::RenderThreadOffscreenGLImpl::GetContextAndResume("
-                 "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>)");
+                 "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>)");
     ContextHandshake::HandOver(*worker, *cell, function);
 }
 
@@ -91,7 +91,7 @@ EGLContext RenderThreadOffscreenGLImpl::TakeParentContext()
 
 EglContext::Priority RenderThreadOffscreenGLImpl::GetPrefferedContextPriority()
 {
-    NIB_FUNCTION("static Nib::EglContext::Priority "
+    NIB_FUNCTION("static EglContext::Priority "
                  "Nib::GLES::RenderThreadOffscreenGLImpl::GetPrefferedContextPriority()");
     const int sdk = System::GetSDKVersion();
     const EglContext::Priority priority =

@@ -16,10 +16,10 @@ namespace
 {
 
 constexpr const char* kConstruct = "bool Nib::EglSyncObjectImpl::Construct()";
-constexpr const char* kWait = "virtual Nib::EglSyncObject::WaitResult "
+constexpr const char* kWait = "virtual EglSyncObject::WaitResult "
                               "Nib::EglSyncObjectImpl::WaitTimeout(uint64_t) const";
 constexpr const char* kGetState =
-    "virtual Nib::EglSyncObject::ObjectState Nib::EglSyncObjectImpl::GetState() const";
+    "virtual EglSyncObject::ObjectState Nib::EglSyncObjectImpl::GetState() const";
 
 std::unique_ptr<EglSyncObject> NewFence()
 {

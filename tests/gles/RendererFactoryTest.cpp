@@ -364,7 +364,7 @@ TEST(RendererFactoryThreads, CreatesASurfaceRenderer)
     EXPECT_STREQ(thread->GetMsgQueue()->getTag(), "surface");
     EXPECT_EQ(driver.LogTexts(ANDROID_LOG_INFO).front(),
               "Nib::RenderThreadGL *Nib::GLES::CreateSurfaceRenderer(const char *, "
-              "Nib::RenderThreadGL::RenderPriority)");
+              "RenderThreadGL::RenderPriority)");
 }
 
 TEST(RendererFactoryThreads, TheSurfaceRendererGetsItsPriority)

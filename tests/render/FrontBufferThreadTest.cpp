@@ -82,12 +82,11 @@ TEST(RenderThreadFBR, SharesWithTheContextOfItsParent)
     EXPECT_EQ(LinesWith(driver, "::Start() - Parent"),
               Lines({"I virtual bool Nib::GLES::RenderThreadFBRImpl::Start() - Parent renderer is "
                      "\"parent\". Start paused and wait for parent context"}));
-    EXPECT_EQ(
-        LinesWith(driver, "GetContextAndResume"),
-        Lines({"I static void Nib::GLES::RenderThreadFBRImpl::GetContextAndResume("
-               "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>), OK! Parent "
-               "context: " +
-               Hex(ContextOf(*parent))}));
+    EXPECT_EQ(LinesWith(driver, "GetContextAndResume"),
+              Lines({"I static void Nib::GLES::RenderThreadFBRImpl::GetContextAndResume("
+                     "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>), OK! Parent "
+                     "context: " +
+                     Hex(ContextOf(*parent))}));
 }
 
 TEST(RenderThreadFBR, HasAFrontBufferConfigurationAndHighPriority)
@@ -136,7 +135,7 @@ TEST(RenderThreadFBR, GetsAContextOfItsOwnWhenTheParentHasNone)
 
     EXPECT_EQ(LinesWith(driver, "GetContextAndResume"),
               Lines({"E static void Nib::GLES::RenderThreadFBRImpl::GetContextAndResume("
-                     "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>), Failed to "
+                     "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>), Failed to "
                      "get main context!"}));
     EXPECT_EQ(driver.Context(ContextOf(*thread)).share, EGL_NO_CONTEXT);
 }
@@ -350,6 +349,25 @@ TEST(RenderThreadFBRPause, OnSurfaceDestroyedReturnsAtOnceWithAWarning)
     EXPECT_EQ(driver.CallCount(), 0u);
     EXPECT_TRUE(thread->IsAttachedToWindow());
     driver.AllowMisuse("glFinish");
+}
+
+TEST(RenderThreadFBRPause, OnSurfaceDestroyedRunsAfterTheResume)
+{
+    SimDriver driver(Gpu());
+    ThreadPtr parent = StartedParent();
+    ThreadPtr thread = StartedThread(parent->GetMsgQueue());
+    ANativeWindow* window = driver.Window(8, 8);
+    thread->OnSurfaceChanged(window, 8, 8, 0);
+    thread->OnPause();
+    driver.AllowMisuse("glFinish"); // it runs before the new context is there
+    driver.AllowMisuse("eglMakeCurrent");
+    thread->OnSurfaceDestroyed();
+
+    thread->OnResume();
+    EXPECT_TRUE(thread->GetMsgQueue()->waitForCompleting());
+
+    EXPECT_FALSE(thread->IsAttachedToWindow());
+    EXPECT_FALSE(driver.WindowState(window).connected);
 }
 
 TEST(RenderThreadFBRPause, SurfaceChangesRunAfterTheResumeInTheirOrder)
@@ -566,10 +584,13 @@ TEST(RenderThreadFBREnd, EndsBothSurfacesThenTheContextThenChecksTheShaders)
 
     EXPECT_EQ(NamesOf(ObjectCalls(driver)), Names({"eglMakeCurrent", "eglDestroySurface",
                                                    "eglDestroySurface", "eglDestroyContext"}));
+    EXPECT_EQ(driver.CallingThreads(), 1u);
     EXPECT_EQ(LinesWith(driver, "DoTerminate"),
               Lines({"I void Nib::GLES::RenderThreadFBRImpl::DoTerminate() RenderThread: " + self +
                      ", Context: " + context}));
     EXPECT_EQ(driver.CountLogContaining("ShaderManager::CheckEmpty() All shaders was cleaned"), 1u);
+    // The destructor of the empty context writes its line once more.
+    EXPECT_EQ(EndsInOrder(driver), Lines({"context", "shaders", "context"}));
     EXPECT_EQ(driver.Live().contexts, 0);
     EXPECT_EQ(driver.Live().surfaces, 0);
 }

@@ -136,12 +136,11 @@ TEST(RenderThreadOffscreenGL, StartWritesItsLinesInOrder)
     EXPECT_EQ(LinesWith(driver, "::Start() - Parent"),
               Lines({"I virtual bool Nib::GLES::RenderThreadOffscreenGLImpl::Start() - Parent "
                      "renderer is \"parent\". Start paused and wait for parent context"}));
-    EXPECT_EQ(
-        LinesWith(driver, "GetContextAndResume"),
-        Lines({"I static void Nib::GLES::RenderThreadOffscreenGLImpl::GetContextAndResume("
-               "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>), OK! Parent "
-               "context: " +
-               parentContext}));
+    EXPECT_EQ(LinesWith(driver, "GetContextAndResume"),
+              Lines({"I static void Nib::GLES::RenderThreadOffscreenGLImpl::GetContextAndResume("
+                     "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>), OK! Parent "
+                     "context: " +
+                     parentContext}));
     EXPECT_EQ(LinesWith(driver, "Impl::Init()"),
               Lines({"I bool Nib::GLES::RenderThreadOffscreenGLImpl::Init()",
                      "I bool Nib::GLES::RenderThreadOffscreenGLImpl::Init() RenderThread: " +
@@ -224,7 +223,7 @@ TEST(RenderThreadOffscreenGL, GetsAContextOfItsOwnWhenTheParentHasNone)
 
     EXPECT_EQ(LinesWith(driver, "GetContextAndResume"),
               Lines({"E static void Nib::GLES::RenderThreadOffscreenGLImpl::GetContextAndResume("
-                     "std::shared_ptr<Nib::IWorkerThread>, std::shared_ptr<EGLContext>), Failed to "
+                     "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>), Failed to "
                      "get main context!"}));
     EXPECT_NE(ContextOf(*thread), EGL_NO_CONTEXT);
     EXPECT_EQ(driver.Context(ContextOf(*thread)).share, EGL_NO_CONTEXT);
@@ -326,7 +325,7 @@ TEST(RenderThreadOffscreenGL, PrefersMediumContextPriorityBelowLevel29)
 
     EXPECT_EQ(driver.Context(ContextOf(*thread)).priority, 0x3102);
     EXPECT_EQ(LinesWith(driver, "Context priority"),
-              Lines({"I static Nib::EglContext::Priority "
+              Lines({"I static EglContext::Priority "
                      "Nib::GLES::RenderThreadOffscreenGLImpl::GetPrefferedContextPriority() - "
                      "Context priority for SDK:28 is 0x3102"}));
 }
@@ -339,7 +338,7 @@ TEST(RenderThreadOffscreenGL, PrefersLowContextPriorityFromLevel29On)
 
     EXPECT_EQ(driver.Context(ContextOf(*thread)).priority, 0x3103);
     EXPECT_EQ(LinesWith(driver, "Context priority"),
-              Lines({"I static Nib::EglContext::Priority "
+              Lines({"I static EglContext::Priority "
                      "Nib::GLES::RenderThreadOffscreenGLImpl::GetPrefferedContextPriority() - "
                      "Context priority for SDK:29 is 0x3103"}));
 }
@@ -448,6 +447,8 @@ TEST(RenderThreadOffscreenGLEnd, EndsThePbufferThenTheContextThenChecksTheShader
               Lines({"I void Nib::GLES::RenderThreadOffscreenGLImpl::DoTerminate() RenderThread: " +
                      self + ", Context: " + context}));
     EXPECT_EQ(driver.CountLogContaining("ShaderManager::CheckEmpty() All shaders was cleaned"), 1u);
+    // The destructor of the empty context writes its line once more.
+    EXPECT_EQ(EndsInOrder(driver), Lines({"context", "shaders", "context"}));
     EXPECT_EQ(driver.Live().contexts, 0);
     EXPECT_EQ(driver.Live().surfaces, 0);
 }

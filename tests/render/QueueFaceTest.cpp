@@ -285,7 +285,7 @@ TEST(CreateSurfaceRenderer, WritesItsLineAndStartsNothing)
 
     EXPECT_EQ(LinesWith(driver, "::Create"),
               Lines({"I Nib::RenderThreadGL *Nib::GLES::CreateSurfaceRenderer(const char *, "
-                     "Nib::RenderThreadGL::RenderPriority)"}));
+                     "RenderThreadGL::RenderPriority)"}));
     EXPECT_EQ(driver.CountLogContaining("WorkerThreadImpl::Start"), 0u);
     EXPECT_EQ(driver.CallCount("eglGetDisplay"), 0u);
 }

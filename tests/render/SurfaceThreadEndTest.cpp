@@ -85,16 +85,8 @@ TEST(RenderThreadGLEnd, ChecksTheShadersAfterTheContextIsGone)
 
     thread.reset();
 
-    std::vector<std::string> order;
-    for (const std::string& line : LinesWith(driver, ""))
-    {
-        if (line.find("EglContext::Destroy") != std::string::npos)
-            order.push_back("context");
-        if (line.find("CheckEmpty") != std::string::npos)
-            order.push_back("shaders");
-    }
     // The destructor of the empty context writes the first line once more.
-    EXPECT_EQ(order, (std::vector<std::string>{"context", "shaders", "context"}));
+    EXPECT_EQ(EndsInOrder(driver), Lines({"context", "shaders", "context"}));
 }
 
 TEST(RenderThreadGLEnd, WithAWindowEndsBothSurfaces)

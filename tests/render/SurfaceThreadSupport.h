@@ -39,4 +39,19 @@ inline std::vector<std::string> CurrentSurfaces(const SimDriver& driver)
     return surfaces;
 }
 
+/// The end of contexts and the check of the shaders in the order of their log lines, as "context"
+/// and "shaders".
+inline std::vector<std::string> EndsInOrder(const SimDriver& driver)
+{
+    std::vector<std::string> order;
+    for (const std::string& line : LinesWith(driver, ""))
+    {
+        if (line == "I void Nib::EglContext::Destroy()")
+            order.push_back("context");
+        if (line.find("ShaderManager::CheckEmpty()") != std::string::npos)
+            order.push_back("shaders");
+    }
+    return order;
+}
+
 #endif
