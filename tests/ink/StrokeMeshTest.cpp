@@ -134,7 +134,7 @@ TEST(StrokeMesh, AnyPositionGivesFiniteTriangles)
         EXPECT_TRUE(std::isfinite(vertex.x) && std::isfinite(vertex.y));
 }
 
-TEST(BrushStyle, FitLeavesAMarginOnTheTighterSide)
+TEST(Placement, FitLeavesAMarginOnTheTighterSide)
 {
     Ink::Recording recording;
     recording.strokes = {{{0, 100, 200, 0.5f}, {1, 300, 250, 0.5f}}};
@@ -143,14 +143,6 @@ TEST(BrushStyle, FitLeavesAMarginOnTheTighterSide)
     EXPECT_FLOAT_EQ(100 * placement.scale + placement.offsetX, 50.0f);
     EXPECT_FLOAT_EQ(300 * placement.scale + placement.offsetX, 950.0f);
     EXPECT_FLOAT_EQ(225 * placement.scale + placement.offsetY, 500.0f);
-}
-
-TEST(BrushStyle, PressureSetsTheWidth)
-{
-    const Ink::BrushStyle style{Ink::BrushKind::Pen, {}, 10.0f};
-    EXPECT_FLOAT_EQ(Ink::ToPage({0, 1, 2, 1.0f}, {}, style).radius, 5.0f);
-    EXPECT_FLOAT_EQ(Ink::ToPage({0, 1, 2, 0.5f}, {}, style).radius, 3.0f);
-    EXPECT_FLOAT_EQ(Ink::ToPage({0, 1, 2, 0.0f}, {}, style).radius, 1.0f);
 }
 
 } // namespace
