@@ -1,29 +1,12 @@
-// The front-buffer render thread: start, pause, surfaces, end. Its frames:
-// FrontBufferFrameTest.cpp.
+// The front-buffer render thread: its surfaces, and what else it does not have in common with the
+// offscreen one. Its frames: FrontBufferFrameTest.cpp.
 
-#include "render/SurfaceThreadSupport.h"
-
-#include <nib/base.h>
-#include <nib/device.h>
+#include "render/ChildThreadSupport.h"
 
 using namespace Nib;
 
 namespace
 {
-
-using ThreadPtr = std::unique_ptr<RenderThreadGL>;
-
-SimGpu Gpu()
-{
-    return SimGpu::Default().WithFrontBuffer().WithEglExtension("EGL_IMG_context_priority");
-}
-
-ThreadPtr StartedParent()
-{
-    ThreadPtr parent(GLES::CreateSurfaceRenderer("parent", RenderThreadGL::Medium));
-    EXPECT_TRUE(parent->Start());
-    return parent;
-}
 
 ThreadPtr NewThread(IGLMsgQueue* parent)
 {
@@ -38,129 +21,24 @@ ThreadPtr StartedThread(IGLMsgQueue* parent = nullptr)
     return thread;
 }
 
-EGLContext ContextOf(RenderThreadGL& thread)
-{
-    return AskOn(thread.GetMsgQueue(), [] { return eglGetCurrentContext(); });
-}
-
 // ---- start --------------------------------------------------------------------------------------
 
 TEST(RenderThreadFBR, AsksForItsNiceValue)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
 
     EXPECT_EQ(AskOn(thread->GetMsgQueue(), [] { return RequestedNiceValue(); }), -10);
 }
 
-TEST(RenderThreadFBR, WithoutAParentSharesWithNothing)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr thread = NewThread(nullptr);
-
-    EXPECT_TRUE(thread->Start());
-
-    EXPECT_EQ(NamesOf(ObjectCalls(driver)),
-              Names({"eglCreateContext", "eglCreatePbufferSurface", "eglMakeCurrent"}));
-    EXPECT_EQ(driver.LastCall("eglCreateContext").args.at(2).Pointer(), nullptr);
-    EXPECT_EQ(LinesWith(driver, "RenderThreadFBRImpl::"),
-              Lines({"I virtual bool Nib::GLES::RenderThreadFBRImpl::Start() - Parent renderer is "
-                     "null. Initialize with independent context",
-                     "I bool Nib::GLES::RenderThreadFBRImpl::Init()",
-                     "I bool Nib::GLES::RenderThreadFBRImpl::Init() RenderThread: " +
-                         Hex(thread.get()) + ", Context: " + Hex(ContextOf(*thread))}));
-}
-
-TEST(RenderThreadFBR, SharesWithTheContextOfItsParent)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr parent = StartedParent();
-    driver.ForgetLog();
-    ThreadPtr thread = StartedThread(parent->GetMsgQueue());
-
-    EXPECT_EQ(driver.Context(ContextOf(*thread)).share, ContextOf(*parent));
-    EXPECT_EQ(LinesWith(driver, "::Start() - Parent"),
-              Lines({"I virtual bool Nib::GLES::RenderThreadFBRImpl::Start() - Parent renderer is "
-                     "\"parent\". Start paused and wait for parent context"}));
-    EXPECT_EQ(LinesWith(driver, "GetContextAndResume"),
-              Lines({"I static void Nib::GLES::RenderThreadFBRImpl::GetContextAndResume("
-                     "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>), OK! Parent "
-                     "context: " +
-                     Hex(ContextOf(*parent))}));
-}
-
 TEST(RenderThreadFBR, HasAFrontBufferConfigurationAndHighPriority)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
 
     const SimContextState context = driver.Context(ContextOf(*thread));
-    const int surfaceType =
-        driver.Gpu().configs.at(static_cast<std::size_t>(context.config)).surfaceType;
     EXPECT_EQ(context.priority, 0x3101);
-    EXPECT_EQ(surfaceType & 0x1000, 0x1000);
-}
-
-TEST(RenderThreadFBR, BindsTheThreadToItsQueueAndReadsTheGLParameters)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr thread = StartedThread();
-
-    EXPECT_EQ(AskOn(thread->GetMsgQueue(), [] { return GetCurrentMsgQueue(); }),
-              thread->GetMsgQueue());
-    EXPECT_TRUE(OpenGLRenderer::IsGLParameterInited());
-}
-
-TEST(RenderThreadFBR, StartWaitsForTheParentsAnswerOnly)
-{
-    SimDriver driver(Gpu());
-    KeepingQueue parent;
-    ThreadPtr thread = NewThread(&parent);
-
-    EXPECT_TRUE(thread->Start());
-
-    EXPECT_EQ(parent.Count(), 1u);
-    EXPECT_EQ(parent.Waits(), 1);
-    EXPECT_FALSE(thread->GetMsgQueue()->isRunning());
-    EXPECT_EQ(driver.CountLogContaining("Init()"), 0u);
-}
-
-TEST(RenderThreadFBR, GetsAContextOfItsOwnWhenTheParentHasNone)
-{
-    SimDriver driver(Gpu());
-    KeepingQueue parent;
-    parent.RunWhileWaitedFor();
-
-    ThreadPtr thread = StartedThread(&parent);
-
-    EXPECT_EQ(LinesWith(driver, "GetContextAndResume"),
-              Lines({"E static void Nib::GLES::RenderThreadFBRImpl::GetContextAndResume("
-                     "std::shared_ptr<IWorkerThread>, std::shared_ptr<EGLContext>), Failed to "
-                     "get main context!"}));
-    EXPECT_EQ(driver.Context(ContextOf(*thread)).share, EGL_NO_CONTEXT);
-}
-
-TEST(RenderThreadFBR, StaysPausedWhenTheParentRefuses)
-{
-    SimDriver driver(Gpu());
-    KeepingQueue parent;
-    parent.Refuse();
-    ThreadPtr thread = NewThread(&parent);
-
-    EXPECT_TRUE(thread->Start());
-
-    EXPECT_FALSE(thread->GetMsgQueue()->isRunning());
-}
-
-TEST(RenderThreadFBR, StartFailsWithoutAThreadAndDoesNotBlock)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr parent = StartedParent();
-    ThreadPtr thread = NewThread(parent->GetMsgQueue());
-    const NoMoreThreads noMore;
-    const LeaksAllowed itsStartTask;
-
-    EXPECT_FALSE(thread->Start());
+    EXPECT_EQ(SurfaceTypeOf(driver, context), 0x1005);
 }
 
 TEST(RenderThreadFBR, GoesOnWithoutAContextOnADeviceWithoutFrontBuffer)
@@ -181,7 +59,7 @@ TEST(RenderThreadFBR, GoesOnWithoutAContextOnADeviceWithoutFrontBuffer)
 
 TEST(RenderThreadFBR, GoesOnWithoutASurface)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = NewThread(nullptr);
     driver.FailNext("eglCreatePbufferSurface", EGL_BAD_ALLOC);
 
@@ -193,25 +71,11 @@ TEST(RenderThreadFBR, GoesOnWithoutASurface)
     EXPECT_EQ(driver.CallCount("eglMakeCurrent"), 0u);
 }
 
-TEST(RenderThreadFBR, GoesOnUnboundWhenTheContextCannotBeMadeCurrent)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr thread = NewThread(nullptr);
-    driver.FailNext("eglMakeCurrent", EGL_BAD_ACCESS);
-
-    EXPECT_TRUE(thread->Start());
-
-    EXPECT_EQ(LinesWith(driver, "Impl::Init()"),
-              Lines({"I bool Nib::GLES::RenderThreadFBRImpl::Init()",
-                     "E bool Nib::GLES::RenderThreadFBRImpl::Init() Failed to MakeCurrent"}));
-    EXPECT_EQ(AskOn(thread->GetMsgQueue(), [] { return GetCurrentMsgQueue(); }), nullptr);
-}
-
 // ---- surfaces -----------------------------------------------------------------------------------
 
 TEST(RenderThreadFBR, OnSurfaceChangedFinishesThenAttaches)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
     ANativeWindow* window = driver.Window(1920, 1080);
     driver.ForgetCalls();
@@ -230,7 +94,7 @@ TEST(RenderThreadFBR, OnSurfaceChangedFinishesThenAttaches)
 
 TEST(RenderThreadFBR, OnSurfaceChangedInitialisesNoUpdateRectangle)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
     driver.ForgetLog();
 
@@ -241,7 +105,7 @@ TEST(RenderThreadFBR, OnSurfaceChangedInitialisesNoUpdateRectangle)
 
 TEST(RenderThreadFBR, OnSurfaceChangedDetachesTheWindowBeforeAndFinishesTwice)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
     thread->OnSurfaceChanged(driver.Window(8, 8), 8, 8, 0);
     driver.ForgetCalls();
@@ -262,7 +126,7 @@ TEST(RenderThreadFBR, OnSurfaceChangedDetachesTheWindowBeforeAndFinishesTwice)
 
 TEST(RenderThreadFBR, OnSurfaceChangedIgnoresItsLastArgument)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     std::vector<std::vector<std::string>> calls;
     for (int last : {0, 1, -1})
     {
@@ -278,7 +142,7 @@ TEST(RenderThreadFBR, OnSurfaceChangedIgnoresItsLastArgument)
 
 TEST(RenderThreadFBR, OnSurfaceDestroyedKeepsTheContextCurrentOnThePbuffer)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
     thread->OnSurfaceChanged(driver.Window(8, 8), 8, 8, 0);
     driver.ForgetCalls();
@@ -297,7 +161,7 @@ TEST(RenderThreadFBR, OnSurfaceDestroyedKeepsTheContextCurrentOnThePbuffer)
 
 TEST(RenderThreadFBR, OnSurfaceDestroyedWithoutAWindowWritesItsLineOnly)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
     driver.ForgetCalls();
     driver.ForgetLog();
@@ -313,7 +177,7 @@ TEST(RenderThreadFBR, OnSurfaceDestroyedWithoutAWindowWritesItsLineOnly)
 
 TEST(RenderThreadFBRPause, OnSurfaceChangedReturnsAtOnceWithAWarning)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = StartedThread(parent->GetMsgQueue());
     thread->OnPause();
@@ -333,7 +197,7 @@ TEST(RenderThreadFBRPause, OnSurfaceChangedReturnsAtOnceWithAWarning)
 
 TEST(RenderThreadFBRPause, OnSurfaceDestroyedReturnsAtOnceWithAWarning)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = StartedThread(parent->GetMsgQueue());
     thread->OnSurfaceChanged(driver.Window(8, 8), 8, 8, 0);
@@ -353,7 +217,7 @@ TEST(RenderThreadFBRPause, OnSurfaceDestroyedReturnsAtOnceWithAWarning)
 
 TEST(RenderThreadFBRPause, OnSurfaceDestroyedRunsAfterTheResume)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = StartedThread(parent->GetMsgQueue());
     ANativeWindow* window = driver.Window(8, 8);
@@ -372,7 +236,7 @@ TEST(RenderThreadFBRPause, OnSurfaceDestroyedRunsAfterTheResume)
 
 TEST(RenderThreadFBRPause, SurfaceChangesRunAfterTheResumeInTheirOrder)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = StartedThread(parent->GetMsgQueue());
     ANativeWindow* first = driver.Window(8, 8);
@@ -403,7 +267,7 @@ TEST(RenderThreadFBRPause, SurfaceChangesRunAfterTheResumeInTheirOrder)
 
 TEST(RenderThreadFBRPause, SurfaceEventsBeforeTheStartWaitForIt)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     KeepingQueue parent;
     ThreadPtr thread = NewThread(&parent);
     thread->Start(); // waits for the parent
@@ -420,66 +284,9 @@ TEST(RenderThreadFBRPause, SurfaceEventsBeforeTheStartWaitForIt)
 
 // ---- pause and resume ---------------------------------------------------------------------------
 
-TEST(RenderThreadFBRPause, ReleasesObjectsThenTellsTheShaderManagerThenEndsTheContext)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr parent = StartedParent();
-    ThreadPtr thread = StartedThread(parent->GetMsgQueue());
-    auto* managed = dynamic_cast<IGLManagedMsgQueue*>(thread->GetMsgQueue());
-    std::vector<std::string> notes;
-    NotedObject first("first", &notes);
-    NotedObject second("second", &notes);
-    Observer<IManagedObject>::Position positions[2];
-    RunOn(thread->GetMsgQueue(),
-          [&]
-          {
-              positions[0] = managed->GetObjectObserver()->Subscribe(&first);
-              positions[1] = managed->GetDataObserver()->Subscribe(&second);
-          });
-    driver.ForgetLog();
-    driver.ForgetCalls();
-
-    thread->OnPause();
-
-    EXPECT_EQ(LinesWith(driver, ""),
-              Lines({"I void Nib::GLES::RenderThreadFBRImpl::DoPause()", "D second release",
-                     "D first release", "I void Nib::ShaderManager::OnDestroyContext()",
-                     "I void Nib::EglContext::Destroy()"}));
-    EXPECT_EQ(NamesOf(ObjectCalls(driver)), Names({"eglMakeCurrent", "eglDestroyContext"}));
-    EXPECT_EQ(notes, Lines({"second release with context", "first release with context"}));
-    EXPECT_FALSE(thread->GetMsgQueue()->isRunning());
-
-    thread->OnResume();
-    EXPECT_TRUE(thread->GetMsgQueue()->waitForCompleting());
-    EXPECT_EQ(notes, Lines({"second release with context", "first release with context",
-                            "first restore with context", "second restore with context"}));
-    RunOn(thread->GetMsgQueue(),
-          [&]
-          {
-              managed->GetObjectObserver()->Unsubscribe(positions[0]);
-              managed->GetObjectObserver()->Unsubscribe(positions[1]);
-          });
-}
-
-TEST(RenderThreadFBRPause, ASecondPauseIsSkippedWithAWarning)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr thread = StartedThread();
-    thread->OnPause();
-    driver.ForgetCalls();
-    driver.ForgetLog();
-
-    thread->OnPause();
-
-    EXPECT_EQ(LinesWith(driver, ""),
-              Lines({"W virtual void Nib::GLES::RenderThreadFBRImpl::OnPause() : Skip DoPause to "
-                     "prevent ANR. Worker is on pause"}));
-    EXPECT_EQ(driver.CallCount(), 0u);
-}
-
 TEST(RenderThreadFBRPause, ResumeMakesANewContextOnTheActiveSurface)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = StartedThread(parent->GetMsgQueue());
     thread->OnSurfaceChanged(driver.Window(8, 8), 8, 8, 0);
@@ -503,44 +310,9 @@ TEST(RenderThreadFBRPause, ResumeMakesANewContextOnTheActiveSurface)
               Lines({"I void Nib::ShaderManager::OnRestoreContext()"}));
 }
 
-TEST(RenderThreadFBRPause, ResumeWithoutAParentLeavesItPaused)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr thread = StartedThread();
-    thread->OnPause();
-    driver.ForgetLog();
-
-    thread->OnResume();
-
-    EXPECT_EQ(
-        LinesWith(driver, ""),
-        Lines({"I virtual void Nib::GLES::RenderThreadFBRImpl::OnResume()",
-               "E virtual void Nib::GLES::RenderThreadFBRImpl::OnResume() m_parent is NULL"}));
-    EXPECT_FALSE(thread->GetMsgQueue()->isRunning());
-}
-
-TEST(RenderThreadFBRPause, ResumeWithoutAContextLeavesTheObjectsReleased)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr parent = StartedParent();
-    ThreadPtr thread = StartedThread(parent->GetMsgQueue());
-    thread->OnPause();
-    driver.ForgetLog();
-    driver.FailNext("eglCreateContext", EGL_BAD_ALLOC);
-
-    thread->OnResume();
-    EXPECT_TRUE(thread->GetMsgQueue()->waitForCompleting());
-
-    EXPECT_EQ(LinesWith(driver, "DoResume"),
-              Lines({"I void Nib::GLES::RenderThreadFBRImpl::DoResume()",
-                     "E void Nib::GLES::RenderThreadFBRImpl::DoResume() Failed to create "
-                     "context"}));
-    EXPECT_EQ(driver.CountLogContaining("OnRestoreContext"), 0u);
-}
-
 TEST(RenderThreadFBRPause, RenderAndWaitReturnFalseAtOnce)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
     thread->OnPause();
     driver.ForgetLog();
@@ -555,24 +327,9 @@ TEST(RenderThreadFBRPause, RenderAndWaitReturnFalseAtOnce)
 
 // ---- end ----------------------------------------------------------------------------------------
 
-TEST(RenderThreadFBREnd, OfAnUnstartedThreadTouchesNothing)
-{
-    SimDriver driver(Gpu());
-    KeepingQueue parent;
-    ThreadPtr thread = NewThread(&parent);
-    driver.ForgetLog();
-
-    thread.reset();
-
-    EXPECT_EQ(driver.CallCount(), 0u);
-    EXPECT_EQ(parent.Waits(), 0);
-    EXPECT_EQ(LinesWith(driver, "RenderThreadFBRImpl"),
-              Lines({"I virtual Nib::GLES::RenderThreadFBRImpl::~RenderThreadFBRImpl()"}));
-}
-
 TEST(RenderThreadFBREnd, EndsBothSurfacesThenTheContextThenChecksTheShaders)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr thread = StartedThread();
     thread->OnSurfaceChanged(driver.Window(8, 8), 8, 8, 0);
     const std::string self = Hex(thread.get());
@@ -595,58 +352,9 @@ TEST(RenderThreadFBREnd, EndsBothSurfacesThenTheContextThenChecksTheShaders)
     EXPECT_EQ(driver.Live().surfaces, 0);
 }
 
-TEST(RenderThreadFBREnd, OfAWaitingThreadGivesTheParentTheChanceToAnswer)
-{
-    SimDriver driver(Gpu());
-    KeepingQueue parent;
-    ThreadPtr thread = NewThread(&parent);
-    thread->Start();
-    SimContext context(driver);
-    parent.RunWhileWaitedFor();
-
-    thread.reset();
-
-    EXPECT_EQ(parent.Waits(), 2);
-    EXPECT_EQ(driver.CountLogContaining("OK! Parent context: " + Hex(context.Handle())), 1u);
-    EXPECT_EQ(driver.CountLogContaining("Init() RenderThread: "), 1u);
-}
-
-TEST(RenderThreadFBREnd, LeavesTheWorkerToAnAnswerThatIsStillQueued)
-{
-    SimDriver driver(Gpu());
-    KeepingQueue parent;
-    ThreadPtr thread = NewThread(&parent);
-    thread->Start();
-    thread.reset();
-    EXPECT_EQ(driver.CountLogContaining("WorkerThreadImpl() Cleanup"), 0u);
-
-    parent.RunAll();
-
-    EXPECT_EQ(driver.CountLogContaining("WorkerThreadImpl() Cleanup"), 1u);
-}
-
-TEST(RenderThreadFBREnd, RunsAResumeThatThePausedParentHasNotAnswered)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr first = StartedParent();
-    ThreadPtr parent = StartedThread(first->GetMsgQueue());
-    ThreadPtr thread = StartedThread(parent->GetMsgQueue());
-    thread->OnPause();
-    parent->OnPause();
-    thread->OnResume(); // asks the paused parent, whose last context is gone
-    EXPECT_FALSE(thread->GetMsgQueue()->isRunning());
-
-    thread.reset();
-
-    EXPECT_EQ(driver.CountLogContaining("FBRImpl::DoResume()"), 1u);
-    EXPECT_EQ(driver.Live().contexts, 2); // the shared one, the first parent's
-    parent->OnResume();                   // now it answers a child that is gone
-    EXPECT_TRUE(parent->GetMsgQueue()->waitForCompleting());
-}
-
 TEST(RenderThreadFBREnd, OfAPausedThreadRunsWhatWaits)
 {
-    SimDriver driver(Gpu());
+    SimDriver driver(ChildGpu());
     ThreadPtr parent = StartedParent();
     ThreadPtr thread = StartedThread(parent->GetMsgQueue());
     thread->OnPause();
@@ -661,36 +369,6 @@ TEST(RenderThreadFBREnd, OfAPausedThreadRunsWhatWaits)
     EXPECT_TRUE(ran);
     EXPECT_EQ(driver.Live().contexts, 2); // the shared one, the parent's
     EXPECT_EQ(driver.Live().surfaces, 1);
-}
-
-/// Posts itself again until the deletion has complained.
-struct Reposter
-{
-    SimDriver& driver;
-    IGLMsgQueue* queue;
-
-    void operator()() const
-    {
-        if (driver.CountLogContaining("tasks in queue ater WaitForExecution") == 0)
-            Post(queue, *this);
-    }
-};
-
-TEST(RenderThreadFBREnd, WarnsAndWaitsAgainWhileTasksPostTasks)
-{
-    SimDriver driver(Gpu());
-    ThreadPtr thread = StartedThread();
-    Post(thread->GetMsgQueue(), Reposter{driver, thread->GetMsgQueue()});
-
-    thread.reset();
-
-    const std::vector<std::string> warnings =
-        LinesWith(driver, "tasks in queue ater WaitForExecution");
-    ASSERT_FALSE(warnings.empty());
-    EXPECT_EQ(warnings.front(),
-              "W void Nib::GLES::RenderThreadFBRImpl::Terminate() : 1 tasks in queue ater "
-              "WaitForExecution. Note! - Some task add new task while execution. Retry waiting.");
-    EXPECT_EQ(driver.Live().contexts, 0);
 }
 
 } // namespace

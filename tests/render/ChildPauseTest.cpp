@@ -1,8 +1,7 @@
-// The offscreen render thread: pause and resume.
+// Render threads that share the context of a parent: pause and resume.
 
-#include "render/SurfaceThreadSupport.h"
+#include "render/ChildThreadSupport.h"
 
-#include <nib/base.h>
 #include <nib/shader_manager.h>
 
 using namespace Nib;
@@ -10,42 +9,12 @@ using namespace Nib;
 namespace
 {
 
-using ThreadPtr = std::unique_ptr<RenderThreadGL>;
-
-SimGpu Gpu()
-{
-    // Two configurations: what the first one lacks is the front buffer.
-    SimConfig ordinary;
-    SimConfig frontBuffer;
-    frontBuffer.surfaceType = 0x1005;
-    return SimGpu::Default()
-        .WithFrontBuffer()
-        .WithConfigs({ordinary, frontBuffer})
-        .WithEglExtension("EGL_IMG_context_priority");
-}
-
-EGLContext ContextOf(RenderThreadGL& thread)
-{
-    return AskOn(thread.GetMsgQueue(), [] { return eglGetCurrentContext(); });
-}
-
-class OffscreenPause : public testing::Test
+class ChildPause : public ChildThread
 {
 protected:
-    OffscreenPause()
-    {
-        System::SetSDKVersion(34);
-        parent.reset(GLES::CreateSurfaceRenderer("parent", RenderThreadGL::Medium));
-        parent->Start();
-    }
+    ChildPause() : parent(StartedParent()) {}
 
-    void Start(bool managed = true, IGLMsgQueue* of = nullptr)
-    {
-        thread.reset(
-            GLES::CreateOffscreenRenderer(of ? of : parent->GetMsgQueue(), "off", managed));
-        ASSERT_TRUE(thread->Start());
-        ASSERT_TRUE(Queue()->waitForCompleting());
-    }
+    void Start(IGLMsgQueue* of = nullptr) { thread = Started(of ? of : parent->GetMsgQueue()); }
 
     IGLMsgQueue* Queue() { return thread->GetMsgQueue(); }
 
@@ -72,7 +41,13 @@ protected:
               });
     }
 
-    SimDriver driver{Gpu()};
+    static std::vector<std::string> Skipped()
+    {
+        return Texts({std::string(GetParam().skipLevel) +
+                      " virtual void Nib::GLES::@::OnPause() : Skip DoPause to prevent ANR. Worker "
+                      "is on pause"});
+    }
+
     ThreadPtr parent;
     ThreadPtr thread;
     std::vector<std::string> notes;
@@ -82,7 +57,9 @@ protected:
     std::vector<Observer<IManagedObject>::Position> positions;
 };
 
-TEST_F(OffscreenPause, ReleasesTheObjectsLastOneFirstWhileTheContextIsThere)
+INSTANTIATE_TEST_SUITE_P(Kinds, ChildPause, testing::ValuesIn(kChildKinds), NameOfKind);
+
+TEST_P(ChildPause, ReleasesTheObjectsLastOneFirstWhileTheContextIsThere)
 {
     Start();
     Subscribe();
@@ -95,7 +72,7 @@ TEST_F(OffscreenPause, ReleasesTheObjectsLastOneFirstWhileTheContextIsThere)
     Unsubscribe();
 }
 
-TEST_F(OffscreenPause, EndsTheContextAndKeepsThePbuffer)
+TEST_P(ChildPause, EndsTheContextAndKeepsThePbuffer)
 {
     Start();
     driver.ForgetCalls();
@@ -108,7 +85,7 @@ TEST_F(OffscreenPause, EndsTheContextAndKeepsThePbuffer)
     EXPECT_FALSE(Queue()->isRunning());
 }
 
-TEST_F(OffscreenPause, DoesItsStepsInOrder)
+TEST_P(ChildPause, DoesItsStepsInOrder)
 {
     Start();
     Subscribe();
@@ -117,15 +94,14 @@ TEST_F(OffscreenPause, DoesItsStepsInOrder)
     thread->OnPause();
 
     EXPECT_EQ(LinesWith(driver, ""),
-              Lines({"I void Nib::GLES::RenderThreadOffscreenGLImpl::DoPause()", "D third release",
-                     "D second release", "D first release",
-                     "I void Nib::ShaderManager::OnDestroyContext()",
+              Texts({"I void Nib::GLES::@::DoPause()", "D third release", "D second release",
+                     "D first release", "I void Nib::ShaderManager::OnDestroyContext()",
                      "I void Nib::EglContext::Destroy()"}));
     thread->OnResume();
     Unsubscribe();
 }
 
-TEST_F(OffscreenPause, RunsTheQueuedTasksFirst)
+TEST_P(ChildPause, RunsTheQueuedTasksFirst)
 {
     Start();
     std::atomic<int> ran{0};
@@ -139,7 +115,7 @@ TEST_F(OffscreenPause, RunsTheQueuedTasksFirst)
     EXPECT_EQ(ran, 10);
 }
 
-TEST_F(OffscreenPause, ASecondPauseIsSkipped)
+TEST_P(ChildPause, ASecondPauseIsSkipped)
 {
     Start();
     thread->OnPause();
@@ -148,25 +124,21 @@ TEST_F(OffscreenPause, ASecondPauseIsSkipped)
 
     thread->OnPause();
 
-    EXPECT_EQ(LinesWith(driver, ""),
-              Lines({"E virtual void Nib::GLES::RenderThreadOffscreenGLImpl::OnPause() : Skip "
-                     "DoPause to prevent ANR. Worker is on pause"}));
+    EXPECT_EQ(LinesWith(driver, ""), Skipped());
     EXPECT_EQ(driver.CallCount(), 0u);
 }
 
-TEST_F(OffscreenPause, APauseBeforeTheStartIsSkipped)
+TEST_P(ChildPause, APauseBeforeTheStartIsSkipped)
 {
-    thread.reset(GLES::CreateOffscreenRenderer(nullptr, "off", true));
+    thread = New(nullptr);
     driver.ForgetLog();
 
     thread->OnPause();
 
-    EXPECT_EQ(LinesWith(driver, ""),
-              Lines({"E virtual void Nib::GLES::RenderThreadOffscreenGLImpl::OnPause() : Skip "
-                     "DoPause to prevent ANR. Worker is on pause"}));
+    EXPECT_EQ(LinesWith(driver, ""), Skipped());
 }
 
-TEST_F(OffscreenPause, RenderReturnsFalseWithoutWaiting)
+TEST_P(ChildPause, RenderReturnsFalseWithoutWaiting)
 {
     Start();
     thread->OnPause();
@@ -180,21 +152,7 @@ TEST_F(OffscreenPause, RenderReturnsFalseWithoutWaiting)
     EXPECT_TRUE(ran);
 }
 
-TEST_F(OffscreenPause, WaitForCompletingReturnsFalseWithoutWaiting)
-{
-    Start();
-    thread->OnPause();
-    driver.ForgetLog();
-
-    EXPECT_FALSE(Queue()->waitForCompleting());
-
-    EXPECT_EQ(LinesWith(driver, ""),
-              Lines({"I virtual bool Nib::GLES::RenderThreadOffscreenGLImpl::waitForCompleting()",
-                     "E virtual bool Nib::GLES::RenderThreadOffscreenGLImpl::waitForCompleting() - "
-                     "worker is on pause!!!"}));
-}
-
-TEST_F(OffscreenPause, ResumeMakesANewContextThatSharesWithTheParents)
+TEST_P(ChildPause, ResumeMakesANewContextThatSharesWithTheParents)
 {
     Start();
     thread->OnPause();
@@ -209,26 +167,7 @@ TEST_F(OffscreenPause, ResumeMakesANewContextThatSharesWithTheParents)
     EXPECT_TRUE(Queue()->isRunning());
 }
 
-TEST_F(OffscreenPause, ResumeUsesTheFrontBufferConfigurationAndTheSamePriority)
-{
-    Start();
-    const SimContextState before = driver.Context(ContextOf(*thread));
-    thread->OnPause();
-
-    thread->OnResume();
-    ASSERT_TRUE(Queue()->waitForCompleting());
-
-    const SimContextState after = driver.Context(ContextOf(*thread));
-    const auto surfaceType = [&](const SimContextState& context)
-    { return driver.Gpu().configs.at(static_cast<std::size_t>(context.config)).surfaceType; };
-    EXPECT_EQ(before.priority, 0x3103);
-    EXPECT_EQ(after.priority, 0x3103);
-    EXPECT_EQ(surfaceType(before), 0x0005);
-    EXPECT_EQ(surfaceType(after), 0x1005);
-    EXPECT_EQ(driver.CountLogContaining("Context priority for SDK:34 is 0x3103"), 2u);
-}
-
-TEST_F(OffscreenPause, ResumeRestoresTheObjectsFirstOneFirst)
+TEST_P(ChildPause, ResumeRestoresTheObjectsFirstOneFirst)
 {
     Start();
     Subscribe();
@@ -243,7 +182,7 @@ TEST_F(OffscreenPause, ResumeRestoresTheObjectsFirstOneFirst)
     Unsubscribe();
 }
 
-TEST_F(OffscreenPause, ResumeDoesItsStepsInOrder)
+TEST_P(ChildPause, ResumeDoesItsStepsInOrder)
 {
     Start();
     Subscribe();
@@ -253,10 +192,8 @@ TEST_F(OffscreenPause, ResumeDoesItsStepsInOrder)
     thread->OnResume();
     ASSERT_TRUE(Queue()->waitForCompleting());
 
-    EXPECT_EQ(LinesWith(driver, "").front(),
-              "I virtual void Nib::GLES::RenderThreadOffscreenGLImpl::OnResume()");
-    EXPECT_EQ(LinesWith(driver, "DoResume"),
-              Lines({"I void Nib::GLES::RenderThreadOffscreenGLImpl::DoResume()"}));
+    EXPECT_EQ(LinesWith(driver, "").front(), Text("I virtual void Nib::GLES::@::OnResume()"));
+    EXPECT_EQ(LinesWith(driver, "DoResume"), Texts({"I void Nib::GLES::@::DoResume()"}));
     EXPECT_EQ(LinesWith(driver, "estore"),
               Lines({"D first restore", "D second restore", "D third restore",
                      "I void Nib::ShaderManager::OnRestoreContext()"}));
@@ -264,7 +201,7 @@ TEST_F(OffscreenPause, ResumeDoesItsStepsInOrder)
     Unsubscribe();
 }
 
-TEST_F(OffscreenPause, TheShaderManagerMovesItsEntriesToTheNewContext)
+TEST_P(ChildPause, TheShaderManagerMovesItsEntriesToTheNewContext)
 {
     Start();
     EGLContext before = EGL_NO_CONTEXT;
@@ -289,7 +226,7 @@ TEST_F(OffscreenPause, TheShaderManagerMovesItsEntriesToTheNewContext)
           });
 }
 
-TEST_F(OffscreenPause, TasksPostedMeanwhileRunFirstStillWithoutAContext)
+TEST_P(ChildPause, TasksPostedMeanwhileRunFirstStillWithoutAContext)
 {
     Start();
     thread->OnPause();
@@ -303,27 +240,26 @@ TEST_F(OffscreenPause, TasksPostedMeanwhileRunFirstStillWithoutAContext)
     EXPECT_TRUE(after);
 }
 
-TEST_F(OffscreenPause, ResumeWithoutAParentLeavesItPaused)
+TEST_P(ChildPause, ResumeWithoutAParentLeavesItPaused)
 {
-    thread.reset(GLES::CreateOffscreenRenderer(nullptr, "off", true));
+    thread = New(nullptr);
     thread->Start();
     thread->OnPause();
     driver.ForgetLog();
 
     thread->OnResume();
 
-    EXPECT_EQ(LinesWith(driver, ""),
-              Lines({"I virtual void Nib::GLES::RenderThreadOffscreenGLImpl::OnResume()",
-                     "E virtual void Nib::GLES::RenderThreadOffscreenGLImpl::OnResume() m_parent "
-                     "is NULL"}));
+    EXPECT_EQ(LinesWith(driver, ""), Texts({"I virtual void Nib::GLES::@::OnResume()",
+                                            "E virtual void Nib::GLES::@::OnResume() m_parent "
+                                            "is NULL"}));
     EXPECT_FALSE(Queue()->isRunning());
 }
 
-TEST_F(OffscreenPause, ResumeWithAParentThatHasNoContextGetsItsOwn)
+TEST_P(ChildPause, ResumeWithAParentThatHasNoContextGetsItsOwn)
 {
     KeepingQueue contextless;
     contextless.RunWhileWaitedFor();
-    Start(true, &contextless);
+    Start(&contextless);
     thread->OnPause();
 
     thread->OnResume();
@@ -334,11 +270,11 @@ TEST_F(OffscreenPause, ResumeWithAParentThatHasNoContextGetsItsOwn)
     thread.reset(); // before its parent
 }
 
-TEST_F(OffscreenPause, ResumeWithAParentThatRefusesLeavesItPaused)
+TEST_P(ChildPause, ResumeWithAParentThatRefusesLeavesItPaused)
 {
     KeepingQueue refusing;
     refusing.RunWhileWaitedFor();
-    Start(true, &refusing);
+    Start(&refusing);
     thread->OnPause();
     refusing.Refuse();
 
@@ -348,7 +284,7 @@ TEST_F(OffscreenPause, ResumeWithAParentThatRefusesLeavesItPaused)
     thread.reset(); // before its parent
 }
 
-TEST_F(OffscreenPause, ResumeWithoutAContextLeavesTheObjectsReleased)
+TEST_P(ChildPause, ResumeWithoutAContextLeavesTheObjectsReleased)
 {
     Start();
     Subscribe();
@@ -362,15 +298,15 @@ TEST_F(OffscreenPause, ResumeWithoutAContextLeavesTheObjectsReleased)
 
     EXPECT_TRUE(notes.empty());
     EXPECT_EQ(LinesWith(driver, "DoResume"),
-              Lines({"I void Nib::GLES::RenderThreadOffscreenGLImpl::DoResume()",
-                     "E void Nib::GLES::RenderThreadOffscreenGLImpl::DoResume() Failed to create "
+              Texts({"I void Nib::GLES::@::DoResume()",
+                     "E void Nib::GLES::@::DoResume() Failed to create "
                      "context"}));
     EXPECT_EQ(driver.CountLogContaining("ShaderManager::OnRestoreContext"), 0u);
     EXPECT_TRUE(Queue()->isRunning());
     Unsubscribe();
 }
 
-TEST_F(OffscreenPause, ResumeGoesOnWhenTheContextCannotBeMadeCurrent)
+TEST_P(ChildPause, ResumeGoesOnWhenTheContextCannotBeMadeCurrent)
 {
     Start();
     Subscribe();
@@ -386,42 +322,7 @@ TEST_F(OffscreenPause, ResumeGoesOnWhenTheContextCannotBeMadeCurrent)
     Unsubscribe();
 }
 
-TEST(OffscreenPauseOnADeviceWithoutFrontBuffer, ResumeFailsAndTheThreadGoesOn)
-{
-    System::SetDesktopFallbacks(false);
-    SimDriver driver(SimGpu::Default().WithoutFrontBuffer());
-    ThreadPtr parent(GLES::CreateSurfaceRenderer("parent", RenderThreadGL::Medium));
-    parent->Start();
-    ThreadPtr thread(GLES::CreateOffscreenRenderer(parent->GetMsgQueue(), "off", true));
-    thread->Start();
-    EXPECT_NE(ContextOf(*thread), EGL_NO_CONTEXT);
-    thread->OnPause();
-
-    thread->OnResume();
-    ASSERT_TRUE(thread->GetMsgQueue()->waitForCompleting());
-
-    EXPECT_EQ(LinesWith(driver, "DoResume() "),
-              Lines({"E void Nib::GLES::RenderThreadOffscreenGLImpl::DoResume() Failed to create "
-                     "context"}));
-    EXPECT_EQ(driver.CountLogContaining("required config is NULL (enableFrontBuffer = true)"), 1u);
-    EXPECT_EQ(ContextOf(*thread), EGL_NO_CONTEXT);
-}
-
-TEST_F(OffscreenPause, UnmanagedObserversAreEmptyAndTheRestHappens)
-{
-    Start(false);
-    driver.ForgetLog();
-
-    thread->OnPause();
-    thread->OnResume();
-    ASSERT_TRUE(Queue()->waitForCompleting());
-
-    EXPECT_EQ(driver.CountLogContaining("ShaderManager::OnDestroyContext"), 1u);
-    EXPECT_EQ(driver.CountLogContaining("ShaderManager::OnRestoreContext"), 1u);
-    EXPECT_NE(ContextOf(*thread), EGL_NO_CONTEXT);
-}
-
-TEST_F(OffscreenPause, MayBeRepeated)
+TEST_P(ChildPause, MayBeRepeated)
 {
     Start();
     Subscribe();
@@ -440,7 +341,7 @@ TEST_F(OffscreenPause, MayBeRepeated)
 
 // ---- deletion while paused ----------------------------------------------------------------------
 
-TEST_F(OffscreenPause, DeletionWaitsForTheParentThenRunsWhatWaits)
+TEST_P(ChildPause, DeletionWaitsForTheParentThenRunsWhatWaits)
 {
     Start();
     thread->OnPause();
@@ -457,9 +358,9 @@ TEST_F(OffscreenPause, DeletionWaitsForTheParentThenRunsWhatWaits)
     EXPECT_EQ(driver.Live().surfaces, 1);
 }
 
-TEST_F(OffscreenPause, DeletionWithoutAParentResumesToo)
+TEST_P(ChildPause, DeletionWithoutAParentResumesToo)
 {
-    thread.reset(GLES::CreateOffscreenRenderer(nullptr, "off", true));
+    thread = New(nullptr);
     thread->Start();
     thread->OnPause();
     std::atomic<bool> ran{false};
@@ -471,12 +372,10 @@ TEST_F(OffscreenPause, DeletionWithoutAParentResumesToo)
     EXPECT_EQ(driver.Live().contexts, 2);
 }
 
-TEST_F(OffscreenPause, DeletionRunsAResumeThatThePausedParentHasNotAnswered)
+TEST_P(ChildPause, DeletionRunsAResumeThatThePausedParentHasNotAnswered)
 {
-    ThreadPtr middle(GLES::CreateOffscreenRenderer(parent->GetMsgQueue(), "middle", true));
-    middle->Start();
-    ASSERT_TRUE(middle->GetMsgQueue()->waitForCompleting());
-    Start(true, middle->GetMsgQueue());
+    ThreadPtr middle = Started(parent->GetMsgQueue());
+    Start(middle->GetMsgQueue());
     thread->OnPause();
     middle->OnPause();
     thread->OnResume(); // asks the paused parent, which cannot answer
@@ -484,18 +383,16 @@ TEST_F(OffscreenPause, DeletionRunsAResumeThatThePausedParentHasNotAnswered)
 
     thread.reset();
 
-    EXPECT_EQ(driver.CountLogContaining("OffscreenGLImpl::DoResume()"), 1u);
+    EXPECT_EQ(driver.CountLogContaining(Text("@::DoResume()")), 1u);
     EXPECT_EQ(driver.Live().contexts, 2); // the shared one, the first parent's
     middle->OnResume();                   // now the parent answers a child that is gone
     EXPECT_TRUE(middle->GetMsgQueue()->waitForCompleting());
 }
 
-TEST_F(OffscreenPause, AChildResumedWhileItsParentIsPausedWaitsForIt)
+TEST_P(ChildPause, AChildResumedWhileItsParentIsPausedWaitsForIt)
 {
-    ThreadPtr middle(GLES::CreateOffscreenRenderer(parent->GetMsgQueue(), "middle", true));
-    middle->Start();
-    ASSERT_TRUE(middle->GetMsgQueue()->waitForCompleting());
-    Start(true, middle->GetMsgQueue());
+    ThreadPtr middle = Started(parent->GetMsgQueue());
+    Start(middle->GetMsgQueue());
     thread->OnPause();
     middle->OnPause();
     thread->OnResume();
