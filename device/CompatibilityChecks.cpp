@@ -1,6 +1,7 @@
 #include "base/Log.h"
 #include "base/ThreadAnnotations.h"
 #include "device/CheckTask.h"
+#include "device/DeviceLists.h"
 #include "device/GlText.h"
 
 #include <nib/base.h>
@@ -32,17 +33,6 @@ CachedCheck g_inBlockList NIB_GUARDED_BY(g_checkLock);
 
 // Renderer name -> whether GL_RENDERER begins with it. Without a lock: one GL thread at a time.
 std::unordered_map<std::string, bool> gCheckedGPUs;
-
-// GPUs that have what front-buffer rendering needs and fail at it all the same.
-const char* g_fbrBlockList[] = {"Adreno (TM) 530", "Mali-T830", nullptr};
-
-// In the order of testing. A substring is enough, so that "EGL_" may be left out.
-constexpr const char* kFbrExtensions[] = {
-    "EGL_KHR_mutable_render_buffer",
-    "KHR_fence_sync",
-    "ANDROID_get_frame_timestamps",
-    "ANDROID_presentation_time",
-};
 
 void LogAnswer(const char* function, bool answer)
 {
@@ -90,7 +80,7 @@ void CheckGL(bool* compatible)
 // Render thread.
 void CheckBlockList(bool* inBlockList)
 {
-    *inBlockList = OpenGLRenderer::isGpuOneOf(g_fbrBlockList);
+    *inBlockList = IsGpuIn(kNoFrontBufferGpus);
 }
 
 bool IsInBlockList()
@@ -104,7 +94,7 @@ bool IsInBlockList()
 
 bool HasFbrExtensions(const Egl& egl)
 {
-    for (const char* extension : kFbrExtensions)
+    for (const char* extension : kFrontBufferExtensions)
     {
         if (!egl.IsEglExtensionSupported(extension))
             return false;

@@ -1,4 +1,5 @@
 #include "base/Log.h"
+#include "device/DeviceLists.h"
 #include "device/GlText.h"
 #include "device/TextureLimits.h"
 
@@ -19,18 +20,6 @@ constexpr int kVendorUnknown = 0;
 constexpr int kVendorArm = 1;
 constexpr int kVendorQualcomm = 2;
 constexpr int kVendorOther = 3;
-
-// Vendor code -> name in the log
-constexpr const char* kVendorNames[] = {
-    "None",     // 0
-    "ARM",      // 1
-    "Qualcomm", // 2
-    "Other",    // 3
-};
-static_assert(std::size(kVendorNames) == 4, "one row per vendor code");
-
-// GPUs on which the blend equations MIN and MAX are not to be used.
-const char* g_noMinMaxBlending[] = {"Mali-400", nullptr};
 
 constexpr int kDefaultMaxTextureSize = 8192; // pixels, until the driver has been asked
 
@@ -71,7 +60,7 @@ void OpenGLRenderer::InitParameters()
     if (IsGLParameterInited())
         return;
     NIB_LOG_INFO("%s", function);
-    m_glParameters.minMaxBlendingSupported.store(!isGpuOneOf(g_noMinMaxBlending),
+    m_glParameters.minMaxBlendingSupported.store(!IsGpuIn(kNoMinMaxBlendingGpus),
                                                  std::memory_order_relaxed);
     getGPUVendor();
     getSupportSampler();
@@ -157,7 +146,7 @@ int OpenGLRenderer::getGPUVendor()
         return kVendorUnknown;
     vendor = DetectVendor(text);
     m_vendor.store(vendor, std::memory_order_relaxed);
-    NIB_LOG_INFO("GPU vendor = %s", kVendorNames[vendor]);
+    NIB_LOG_INFO("GPU vendor = %s", kGpuVendorNames[vendor]);
     return vendor;
 }
 
@@ -197,7 +186,7 @@ int OpenGLRenderer::getMaliDriverVersion()
         revision = static_cast<int>(std::strtol(mark + std::strlen(kRevisionMark), nullptr, 10));
         m_maliDriverVersion.store(revision, std::memory_order_relaxed);
     }
-    NIB_LOG_INFO("Mali driver Info: %s, version %i", kVendorNames[vendor], revision);
+    NIB_LOG_INFO("Mali driver Info: %s, version %i", kGpuVendorNames[vendor], revision);
     return revision;
 }
 

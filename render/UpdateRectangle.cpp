@@ -5,6 +5,7 @@
 #include <nib/texture.h>
 
 #include "base/Log.h"
+#include "device/DeviceLists.h"
 #include "egl/EglTokens.h"
 #include "render/UpdateArithmetic.h"
 
@@ -34,41 +35,12 @@ constexpr std::uint32_t kTiledRenderingMode = kTiledRendering | kKeepHistory | k
 constexpr std::uint32_t kPreservedMode = kPreserved | kConfigured;                          // 0x09
 constexpr std::uint32_t kFullScreenMode = kConfigured;                                      // 0x01
 
-constexpr int kMaliTileSize = 32;        // pixels
-constexpr int kHistoryLength = 3;        // frames
-constexpr int kMaxPropertyLength = 92;   // the platform's, the end of the text included
-constexpr int kMaliT760DamageLevel = 26; // the API level from which this GPU takes damage regions
+constexpr int kMaliTileSize = 32;      // pixels
+constexpr int kHistoryLength = 3;      // frames
+constexpr int kMaxPropertyLength = 92; // the platform's, the end of the text included
 constexpr int kKeepColor = 1;
 constexpr int kDepthAndStencil = 6;
 constexpr int kPreserveNothing = 0;
-
-bool IsNoBufferAgeGpu()
-{
-    const char* names[] = {"Adreno (TM) 330", "Adreno (TM) 306", "Adreno (TM) 305",
-                           "Adreno (TM) 308", nullptr};
-    return OpenGLRenderer::isGpuOneOf(names);
-}
-
-bool IsPartialUpdateGpu()
-{
-    const bool maliT760 = System::GetSDKVersion() >= kMaliT760DamageLevel;
-    const char* names[] = {"Mali-T720",
-                           "Mali-T820",
-                           "Mali-T830",
-                           "Mali-T880",
-                           "Mali-G71",
-                           "Mali-G72",
-                           maliT760 ? "Mali-T760" : nullptr,
-                           nullptr};
-    return OpenGLRenderer::isGpuOneOf(names);
-}
-
-bool IsTiledMaliGpu()
-{
-    const bool maliT760 = System::GetSDKVersion() < kMaliT760DamageLevel;
-    const char* names[] = {"Mali-T860", maliT760 ? "Mali-T760" : nullptr, nullptr};
-    return OpenGLRenderer::isGpuOneOf(names);
-}
 
 template <typename Function>
 void Resolve(Function& entry, const char* name)
@@ -152,7 +124,7 @@ void UpdateRectangle::InitEGLExtensions()
 void UpdateRectangle::SetUpdateMode()
 {
     NIB_FUNCTION("void Nib::UpdateRectangle::SetUpdateMode()");
-    if (IsNoBufferAgeGpu())
+    if (IsGpuIn(kNoBufferAgeGpus))
     {
         NIB_LOG_INFO("%s. Do not use BUFFER_AGE_KHR extension!", function);
         m_noBufferAge = true;
@@ -162,12 +134,13 @@ void UpdateRectangle::SetUpdateMode()
         m_mode = kPostSubBufferMode;
         NIB_LOG_INFO("%s : eglPostSubBuffer Suported", function);
     }
-    else if (IsPartialUpdateGpu() && m_setDamageRegion != nullptr && !m_noBufferAge)
+    else if (IsGpuIn(PartialUpdateGpus(System::GetSDKVersion())) && m_setDamageRegion != nullptr &&
+             !m_noBufferAge)
     {
         m_mode = kDamageRegionMode;
         NIB_LOG_INFO("%s: SupportPartialUpdateGPU Mode = 0x%X", function, m_mode);
     }
-    else if (IsTiledMaliGpu())
+    else if (IsGpuIn(TileAlignedGpus(System::GetSDKVersion())))
     {
         m_mode = kTileAlignedMode;
         m_tileSize = kMaliTileSize;

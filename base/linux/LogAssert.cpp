@@ -1,4 +1,4 @@
-#include "base/linux/LogSink.h"
+#include "base/linux/LogWriter.h"
 
 #include <nib/export.h>
 
@@ -17,7 +17,7 @@ extern "C" NIB_EXPORT void __android_log_assert(const char*, const char* tag, co
     {
         std::va_list arguments;
         va_start(arguments, format);
-        Nib::WriteLog(ANDROID_LOG_FATAL, tag, format, arguments);
+        Nib::WriteLog(ANDROID_LOG_FATAL, tag, Nib::FormatLog(format, arguments));
         va_end(arguments);
     }
     std::abort();

@@ -1,4 +1,5 @@
-#include "base/linux/LogSink.h"
+#include "base/linux/LogWriter.h"
+#include "base/LogSinkHolder.h"
 
 #include <nib/export.h>
 
@@ -11,11 +12,20 @@
 extern "C" NIB_EXPORT int __android_log_print(int priority, const char* tag, const char* format,
                                               ...)
 {
-    if (!Nib::IsLogged(priority))
+    Nib::LogSinkHolder& sink = Nib::LogSinkHolder::Instance();
+    const bool logged = Nib::IsLogged(priority);
+    const bool taken = sink.Wants(priority);
+    if (!logged && !taken)
         return -EPERM;
+    const int callersErrno = errno;
     std::va_list arguments;
     va_start(arguments, format);
-    Nib::WriteLog(priority, tag, format, arguments);
+    const std::string message = Nib::FormatLog(format, arguments);
     va_end(arguments);
-    return 1;
+    if (logged)
+        Nib::WriteLog(priority, tag, message);
+    if (taken)
+        sink.Take(priority, message.c_str());
+    errno = callersErrno;
+    return logged ? 1 : -EPERM;
 }

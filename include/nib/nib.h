@@ -11,6 +11,7 @@
 #include <nib/exceptions.h>
 #include <nib/export.h>
 #include <nib/geometry.h>
+#include <nib/log.h>
 #include <nib/managed_object.h>
 #include <nib/matrix.h>
 #include <nib/msg_queue.h>
