@@ -55,6 +55,17 @@ TEST_P(ChildThreadEnd, OfAWaitingThreadWhoseParentIsSilentRunsItsStartFirst)
     EXPECT_EQ(driver.Live().contexts, 0);
 }
 
+TEST_P(ChildThreadEnd, OfARunningThreadDoesNotWaitForTheParent)
+{
+    KeepingQueue parent;
+    parent.RunWhileWaitedFor();
+    ThreadPtr thread = Started(&parent);
+
+    thread.reset();
+
+    EXPECT_EQ(parent.Waits(), 1); // at the start
+}
+
 TEST_P(ChildThreadEnd, LeavesTheWorkerToAnAnswerThatIsStillQueued)
 {
     KeepingQueue parent;

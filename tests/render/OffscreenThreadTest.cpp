@@ -247,7 +247,7 @@ TEST(RenderThreadOffscreenGLEnd, EndsThePbufferThenTheContextThenChecksTheShader
                      self + ", Context: " + context}));
     EXPECT_EQ(driver.CountLogContaining("ShaderManager::CheckEmpty() All shaders was cleaned"), 1u);
     // The destructor of the empty context writes its line once more.
-    EXPECT_EQ(EndsInOrder(driver), Lines({"context", "shaders", "context"}));
+    EXPECT_EQ(EndsInOrder(driver), Lines({"context", "shaders", "context", "worker"}));
     EXPECT_EQ(driver.Live().contexts, 0);
     EXPECT_EQ(driver.Live().surfaces, 0);
 }

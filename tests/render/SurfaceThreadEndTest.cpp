@@ -86,7 +86,7 @@ TEST(RenderThreadGLEnd, ChecksTheShadersAfterTheContextIsGone)
     thread.reset();
 
     // The destructor of the empty context writes the first line once more.
-    EXPECT_EQ(EndsInOrder(driver), Lines({"context", "shaders", "context"}));
+    EXPECT_EQ(EndsInOrder(driver), Lines({"context", "shaders", "worker", "context"}));
 }
 
 TEST(RenderThreadGLEnd, WithAWindowEndsBothSurfaces)

@@ -39,8 +39,7 @@ inline std::vector<std::string> CurrentSurfaces(const SimDriver& driver)
     return surfaces;
 }
 
-/// The end of contexts and the check of the shaders in the order of their log lines, as "context"
-/// and "shaders".
+/// What ends, in the order of the log lines: "context", "worker", and "shaders" for their check.
 inline std::vector<std::string> EndsInOrder(const SimDriver& driver)
 {
     std::vector<std::string> order;
@@ -50,6 +49,8 @@ inline std::vector<std::string> EndsInOrder(const SimDriver& driver)
             order.push_back("context");
         if (line.find("ShaderManager::CheckEmpty()") != std::string::npos)
             order.push_back("shaders");
+        if (line.find("WorkerThreadImpl() Cleanup") != std::string::npos)
+            order.push_back("worker");
     }
     return order;
 }

@@ -35,6 +35,35 @@ protected:
             EXPECT_TRUE(worker->EnqueueAsyncTask(record.NewTask(entry)));
     }
 
+    /// Starts and terminates @p followed, with @p tasks queued behind the last one that still runs.
+    static void TerminateLeaving(FollowedWorker& followed, const std::vector<ITask*>& tasks)
+    {
+        followed.Start(!kPaused);
+        Event allQueued; // until then the worker does not reach the terminate task
+        followed.EnqueueQuietly(new CallTask([&] { allQueued.Wait(); }));
+        followed.onEnqueue = [&] // the terminate task is in the queue
+        {
+            for (ITask* task : tasks)
+                followed.EnqueueQuietly(task);
+            allQueued.Set();
+        };
+        followed.Terminate();
+    }
+
+    /// The number of queued tasks in the line of a wait that a worker refuses, since it is paused.
+    std::string QueuedWhilePaused(IWorkerThread& paused)
+    {
+        driver.ForgetLog();
+        EXPECT_FALSE(paused.WaitForExecution(nullptr));
+        const std::string line = driver.LogTexts(ANDROID_LOG_ERROR).at(0);
+        const std::string head = "virtual bool Nib::WorkerThreadImpl::WaitForExecution(int *). "
+                                 "Worker is on pause (Queued task: ";
+        const std::string tail = "). No task executed.";
+        EXPECT_EQ(line.substr(0, head.size()), head);
+        EXPECT_EQ(line.substr(line.size() - tail.size()), tail);
+        return line.substr(head.size(), line.size() - head.size() - tail.size());
+    }
+
     SimDriver driver;
     Record record;
     std::unique_ptr<IWorkerThread> worker = NewWorker();
@@ -235,17 +264,9 @@ TEST_F(WorkerThread, TasksBehindTheLastOneStayForTheNextStart)
 {
     FollowedWorker followed;
     std::atomic<int> deleted{0};
-    followed.Start(!kPaused);
-    Event allQueued; // until then the worker does not reach the terminate task
-    followed.EnqueueQuietly(new CallTask([&] { allQueued.Wait(); }));
-    followed.onEnqueue = [&] // the terminate task is in the queue
-    {
-        followed.EnqueueQuietly(new CallTask([&] { record.Add(1); }, &deleted));
-        followed.EnqueueQuietly(new CallTask([&] { record.Add(2); }, &deleted));
-        allQueued.Set();
-    };
 
-    followed.Terminate();
+    TerminateLeaving(followed, {new CallTask([&] { record.Add(1); }, &deleted),
+                                new CallTask([&] { record.Add(2); }, &deleted)});
 
     EXPECT_EQ(record.Entries(), Numbers({}));
     EXPECT_EQ(deleted.load(), 0);
@@ -259,30 +280,28 @@ TEST_F(WorkerThread, TasksBehindTheLastOneStayForTheNextStart)
 TEST_F(WorkerThread, TasksLeftBehindAreCountedAgain)
 {
     FollowedWorker followed;
-    followed.Start(!kPaused);
-    Event allQueued;
-    followed.EnqueueQuietly(new CallTask([&] { allQueued.Wait(); }));
-    followed.onEnqueue = [&]
-    {
-        followed.EnqueueQuietly(record.NewTask(1));
-        allQueued.Set();
-    };
-    followed.Terminate();
-    driver.ForgetLog();
+    TerminateLeaving(followed, {record.NewTask(1)});
 
-    EXPECT_FALSE(followed.WaitForExecution(nullptr));
+    EXPECT_EQ(QueuedWhilePaused(followed), "0");
     followed.Start(kPaused);
-    EXPECT_FALSE(followed.WaitForExecution(nullptr));
+    EXPECT_EQ(QueuedWhilePaused(followed), "1");
 
-    EXPECT_EQ(driver.LogTexts(ANDROID_LOG_ERROR),
-              (std::vector<std::string>{
-                  "virtual bool Nib::WorkerThreadImpl::WaitForExecution(int *). Worker is on pause "
-                  "(Queued task: 0). No task executed.",
-                  "virtual bool Nib::WorkerThreadImpl::WaitForExecution(int *). Worker is on pause "
-                  "(Queued task: 1). No task executed."}));
     followed.Resume();
     followed.Terminate();
     EXPECT_EQ(record.Entries(), Numbers({1}));
+}
+
+TEST_F(WorkerThread, TasksLeftBehindAreCountedOnce)
+{
+    FollowedWorker followed;
+    TerminateLeaving(followed, {record.NewTask(1)});
+    followed.Start(!kPaused);
+    followed.Terminate(); // runs it
+
+    followed.Start(kPaused);
+
+    EXPECT_EQ(QueuedWhilePaused(followed), "0");
+    followed.Resume();
 }
 
 TEST_F(WorkerThread, TasksOfADestroyedWorkerAreNeitherRunNorDeleted)
