@@ -47,8 +47,12 @@ void AddDrawCommand(CLI::App& app)
                      "Of a stroke at full pressure, in pixels; each brush has one of its own");
     draw->add_option("--paper", options->paper, "Colour of the page, given like --color")
         ->capture_default_str();
-    draw->add_option("--speed", options->speed, "Times the recorded speed, or 'max'; for --window")
-        ->capture_default_str();
+    draw->add_option("--speed", options->speed,
+                     "Show frames, one a sample, at this many times the recorded speed, or as fast "
+                     "as they go for 'max'; without a window on an offscreen screen. A window's is "
+                     "1 unless given");
+    draw->add_flag("--json{-}", options->json,
+                   "Print the figures of the run as JSON; --json=FILE writes them there");
     draw->add_flag("--keep", options->keep, "Leave the window open after the replay");
     draw->add_flag("--front-buffer", options->frontBuffer,
                    "Draw into the window's visible buffer where the device can");

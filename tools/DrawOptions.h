@@ -18,7 +18,9 @@ struct DrawOptions
     std::optional<std::string> colour; ///< else the brush's own
     std::optional<std::string> width;  ///< else the brush's own
     std::string paper = "white";
-    std::string speed = "1";
+    std::optional<std::string>
+        speed;               ///< else the recorded one in a window, and no frames elsewhere
+    std::string json;        ///< "-": standard output; a file; empty: none
     std::string loseContext; ///< "every:N"
     int exportedPages = 0;
     bool window = false;

@@ -3,8 +3,11 @@
 #include "FrontBuffer.h"
 #include "PageExport.h"
 #include "PngFile.h"
+#include "Progress.h"
 #include "Recordings.h"
 #include "RenderThreads.h"
+#include "ReplacementFile.h"
+#include "Replay.h"
 #include "UserError.h"
 
 #include <chrono>
@@ -16,11 +19,16 @@
 namespace
 {
 
-void Print(const Figures& figures)
+/// @p json: nothing, "-" for standard output, or a file's name.
+void Report(const Figures& figures, const std::string& json)
 {
-    std::printf("%d strokes, %d samples, %d frames\n", figures.strokes, figures.samples,
-                figures.frames);
+    if (json != "-")
+        std::printf("%s\n", Summary(figures).c_str());
+    else
+        std::printf("%s\n", ToJson(figures).c_str());
     std::fflush(stdout);
+    if (!json.empty() && json != "-")
+        WriteTextFile(json, ToJson(figures) + "\n");
 }
 
 void WaitUntilClosed(XWindow& window)
@@ -32,7 +40,8 @@ void WaitUntilClosed(XWindow& window)
 } // namespace
 
 Drawing::Drawing(const DrawOptions& options)
-    : m_options(options), m_size(ParseSize(options.size)), m_speed(ParseSpeed(options.speed)),
+    : m_options(options), m_size(ParseSize(options.size)),
+      m_speed(ParseSpeed(options.speed.value_or("1"))),
       m_loseContextEvery(ParseLoseContext(options.loseContext)), m_style(StyleOf(options)),
       m_paper(ParseColourOption("--paper", options.paper)),
       m_recording(ReadRecordings(options.files))
@@ -72,37 +81,51 @@ void Drawing::DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent,
     Ink::InkSession session(thread, m_size.width, m_size.height, m_paper);
     if (window)
         session.AttachWindow(window->NativeWindow());
+    else if (ShowsFrames())
+        session.AttachScreen();
     CheckDrawn(session.Error());
     if (pages)
         pages->Start(m_recording, m_placement, m_style, m_size, m_paper);
-    const Figures figures = Play(session, window);
+    Figures figures = Play(session, window);
     CheckDrawn(session.Error());
     if (pages)
         CheckDrawn(pages->Finish());
     if (!m_options.output.empty())
         WritePng(m_options.output, session.ReadPixels(), m_size.width, m_size.height);
-    Print(figures);
+    figures.programs = Ink::Program::Counts();
+    Report(figures, m_options.json);
     if (window && m_options.keep)
         WaitUntilClosed(*window);
     if (window)
         thread.OnSurfaceDestroyed();
 }
 
+/// Draws the recording; frame by frame where there is something to show them on.
 Figures Drawing::Play(Ink::InkSession& session, XWindow* window) const
 {
     Pace pace;
+    pace.loseContextEvery = m_loseContextEvery;
     if (window)
+        pace.isWanted = [window] { return window->IsOpen(); };
+    if (ShowsFrames())
     {
-        session.Present(); // the empty page
         pace.speed = m_speed;
         pace.framePerSample = true;
-        pace.isWanted = [window] { return window->IsOpen(); };
+        session.Present(); // the empty page
     }
-    if (m_loseContextEvery != 0)
-        pace.afterSample = [&session, every = m_loseContextEvery](int samples)
-        {
-            if (samples % every == 0)
-                session.LoseContext();
-        };
-    return Replay(session, m_recording, m_placement, m_style, pace);
+    const long long before = session.Figures().redrawnPixels;
+    Progress progress(SampleCount(m_recording));
+    pace.afterSample = [&progress](int samples) { progress.Show(samples); };
+    Figures figures = Replay(session, m_recording, m_placement, m_style, pace);
+    const Ink::SessionFigures done = session.Figures();
+    figures.tasks = done.tasks;
+    if (figures.frames > 0)
+        figures.redrawn = static_cast<double>(done.redrawnPixels - before) / figures.frames /
+                          m_size.width / m_size.height;
+    return figures;
+}
+
+bool Drawing::ShowsFrames() const
+{
+    return m_options.window || m_options.speed;
 }

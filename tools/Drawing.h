@@ -3,9 +3,9 @@
 
 #include "BrushStyle.h"
 #include "DrawOptions.h"
+#include "Figures.h"
 #include "InkSession.h"
 #include "Recording.h"
-#include "Replay.h"
 #include "XWindow.h"
 
 #include <nib/nib.h>
@@ -21,6 +21,7 @@ public:
 
 private:
     void DrawOn(Nib::RenderThreadGL& thread, Nib::RenderThreadGL& parent, XWindow* window) const;
+    bool ShowsFrames() const;
     Figures Play(Ink::InkSession& session, XWindow* window) const;
 
     const DrawOptions& m_options;

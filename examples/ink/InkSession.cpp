@@ -22,6 +22,7 @@ struct InkSession::GlState
 template <typename Work>
 void InkSession::PostGuarded(Work work)
 {
+    ++m_tasks;
     Post(*m_thread.GetMsgQueue(),
          [gl = m_gl, work = std::move(work)]
          {
@@ -61,8 +62,17 @@ InkSession::~InkSession()
 void InkSession::AttachWindow(void* window)
 {
     m_thread.OnSurfaceChanged(window, m_width, m_height, 0);
-    PostGuarded([width = m_width, height = m_height](GlState& gl)
-                { gl.view = std::make_unique<PageView>(width, height); });
+    PostGuarded(
+        [width = m_width, height = m_height](GlState& gl)
+        { gl.view = std::make_unique<PageView>(width, height, PageView::Surface::Window); });
+    m_dirty.Set(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
+}
+
+void InkSession::AttachScreen()
+{
+    PostGuarded(
+        [width = m_width, height = m_height](GlState& gl)
+        { gl.view = std::make_unique<PageView>(width, height, PageView::Surface::Screen); });
     m_dirty.Set(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
 }
 
@@ -89,6 +99,7 @@ void InkSession::Present()
                 gl.view->Draw(gl.page->Texture(), visible);
         });
     m_thread.Render();
+    m_tasks += 2; // the thread's own, before the view and behind it
 }
 
 void InkSession::LoseContext()
@@ -98,6 +109,8 @@ void InkSession::LoseContext()
         {
             gl.page->Suspend();
             gl.painter.Suspend();
+            if (gl.view)
+                gl.view->Suspend();
         });
     m_thread.OnPause(); // behind the task above; the objects let go of their GL names
 
@@ -107,21 +120,45 @@ void InkSession::LoseContext()
         {
             gl.page->Resume();
             gl.painter.Resume();
+            if (gl.view)
+                gl.view->Resume();
         });
-    m_thread.GetMsgQueue()->waitForCompleting(); // OnResume itself does not wait for the context
+    Wait(); // OnResume itself does not wait for the context
 }
 
 std::vector<std::uint8_t> InkSession::ReadPixels()
 {
+    return ReadBack([](GlState& gl) { return gl.page->ReadPixels(); });
+}
+
+std::vector<std::uint8_t> InkSession::ReadScreen()
+{
+    return ReadBack([](GlState& gl)
+                    { return gl.view ? gl.view->ReadScreen() : std::vector<std::uint8_t>(); });
+}
+
+std::vector<std::uint8_t> InkSession::ReadBack(std::vector<std::uint8_t> (*read)(GlState&))
+{
     auto pixels = std::make_shared<std::vector<std::uint8_t>>();
-    PostGuarded([pixels](GlState& gl) { *pixels = gl.page->ReadPixels(); });
-    m_thread.GetMsgQueue()->waitForCompleting();
+    PostGuarded([pixels, read](GlState& gl) { *pixels = read(gl); });
+    Wait();
     return std::move(*pixels);
+}
+
+SessionFigures InkSession::Figures()
+{
+    Wait();
+    return {m_tasks, m_gl->view ? m_gl->view->RedrawnPixels() : 0};
+}
+
+void InkSession::Wait()
+{
+    m_thread.GetMsgQueue()->waitForCompleting();
 }
 
 std::string InkSession::Error()
 {
-    m_thread.GetMsgQueue()->waitForCompleting();
+    Wait();
     return m_gl->error;
 }
 

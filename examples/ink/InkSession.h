@@ -15,6 +15,13 @@
 namespace Ink
 {
 
+/// What a session has had done.
+struct SessionFigures
+{
+    long long tasks = 0;         ///< that were given to the render thread
+    long long redrawnPixels = 0; ///< of the window or the screen, in all frames together
+};
+
 /// A page on a render thread, as an application drives it: every operation may be called from the
 /// application's thread and posts its GL work to the render thread.
 ///
@@ -32,6 +39,9 @@ public:
     /// Shows the page in @p window, which has the page's size. [blocks]
     void AttachWindow(void* window);
 
+    /// Without a window, frames go to an offscreen screen of the page's size. Never blocks.
+    void AttachScreen();
+
     /// Paints a piece of a stroke onto the page; it is not shown yet. Never blocks.
     void Draw(InkPiece piece);
 
@@ -46,6 +56,15 @@ public:
     /// The page as it is now: RGBA, premultiplied, top row first. [blocks]
     std::vector<std::uint8_t> ReadPixels();
 
+    /// What the screen shows, as ReadPixels gives the page. Empty without a screen. [blocks]
+    std::vector<std::uint8_t> ReadScreen();
+
+    /// What the session has had done so far. [blocks]
+    SessionFigures Figures();
+
+    /// Until everything so far is drawn. [blocks]
+    void Wait();
+
     /// [blocks] The first failure on the render thread, or an empty text.
     std::string Error();
 
@@ -53,12 +72,14 @@ private:
     struct GlState;
     template <typename Work>
     void PostGuarded(Work work);
+    std::vector<std::uint8_t> ReadBack(std::vector<std::uint8_t> (*read)(GlState&));
 
     Nib::RenderThreadGL& m_thread;
     int m_width;
     int m_height;
     std::shared_ptr<GlState> m_gl; // its contents are touched on the render thread alone
-    Nib::RectF m_dirty;            // page pixels, y downward; what changed since the last frame
+    long long m_tasks = 0;
+    Nib::RectF m_dirty; // page pixels, y downward; what changed since the last frame
 };
 
 } // namespace Ink

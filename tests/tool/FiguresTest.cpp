@@ -1,0 +1,96 @@
+#include "Figures.h"
+
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+#include <numeric>
+
+namespace
+{
+
+using Json = nlohmann::json;
+
+/// Four hundred frames, the slower ones first: 400 ms, 399 ms, ... 1 ms.
+Figures WithFrames()
+{
+    Figures figures;
+    figures.strokes = 3;
+    figures.samples = 400;
+    figures.frames = 400;
+    figures.tasks = 1601;
+    figures.seconds = 1.5;
+    figures.frameTimes.resize(400);
+    std::iota(figures.frameTimes.rbegin(), figures.frameTimes.rend(), 1.0f);
+    figures.redrawn = 0.0123;
+    figures.programs = {2, 5};
+    return figures;
+}
+
+Figures WithoutFrames()
+{
+    Figures figures;
+    figures.strokes = 1;
+    figures.samples = 2;
+    figures.tasks = 4;
+    figures.programs = {1, 0};
+    return figures;
+}
+
+TEST(Percentile, IsTheLeastTimeThatSoManyKept)
+{
+    const std::vector<float> times = WithFrames().frameTimes;
+    EXPECT_EQ(Percentile(times, 50), 200.0f);
+    EXPECT_EQ(Percentile(times, 95), 380.0f);
+    EXPECT_EQ(Percentile(times, 99), 396.0f);
+    EXPECT_EQ(Percentile(times, 100), 400.0f);
+    EXPECT_EQ(Percentile(times, 0), 1.0f);
+}
+
+TEST(Percentile, OfAFewFrames)
+{
+    EXPECT_EQ(Percentile({7.0f}, 50), 7.0f);
+    EXPECT_EQ(Percentile({9.0f, 7.0f}, 50), 7.0f);
+    EXPECT_EQ(Percentile({9.0f, 7.0f}, 51), 9.0f);
+    EXPECT_EQ(Percentile({}, 50), std::nullopt);
+}
+
+TEST(Figures, OneLineForPeople)
+{
+    EXPECT_EQ(Summary(WithFrames()),
+              "3 strokes, 400 samples, 400 frames, 1601 tasks, 1.23 % of the pixels redrawn, "
+              "frame time p50 200.00 p95 380.00 p99 396.00 ms, programs 2 compiled 5 loaded");
+}
+
+TEST(Figures, LineWithoutFramesLeavesThemOut)
+{
+    EXPECT_EQ(Summary(WithoutFrames()),
+              "1 strokes, 2 samples, 0 frames, 4 tasks, programs 1 compiled 0 loaded");
+}
+
+TEST(Figures, JsonHoldsThemAll)
+{
+    EXPECT_EQ(Json::parse(ToJson(WithFrames())), Json::parse(R"({
+        "strokes": 3, "samples": 400, "frames": 400, "tasks": 1601, "seconds": 1.5,
+        "redrawn_share": 0.0123, "frame_ms": {"p50": 200.0, "p95": 380.0, "p99": 396.0},
+        "programs": {"compiled": 2, "loaded": 5}})"));
+}
+
+TEST(Figures, JsonWithoutFramesHasNull)
+{
+    const Json figures = Json::parse(ToJson(WithoutFrames()));
+    EXPECT_TRUE(figures.at("redrawn_share").is_null());
+    EXPECT_TRUE(figures.at("frame_ms").is_null());
+    EXPECT_EQ(figures.at("frames"), 0);
+}
+
+TEST(Figures, JsonIsOneLineOfShortNumbers)
+{
+    Figures figures = WithFrames();
+    figures.frameTimes.assign(1, 0.1f); // not a round number of doubles
+    figures.redrawn = 1.0 / 3.0;
+    const std::string text = ToJson(figures);
+    EXPECT_EQ(text.find('\n'), std::string::npos);
+    EXPECT_NE(text.find("\"p50\":0.1,"), std::string::npos) << text;
+    EXPECT_NE(text.find("\"redrawn_share\":0.333333,"), std::string::npos) << text;
+}
+
+} // namespace
