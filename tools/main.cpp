@@ -1,4 +1,5 @@
 #include "DrawCommand.h"
+#include "InfoCommand.h"
 #include "Recording.h"
 #include "UserError.h"
 
@@ -31,6 +32,7 @@ int main(int argc, char** argv)
     app.set_version_flag("--version", std::string("nib ") + Nib::GetVersionString());
     app.require_subcommand(1);
     AddDrawCommand(app);
+    AddInfoCommand(app);
     try
     {
         app.parse(argc, argv);
