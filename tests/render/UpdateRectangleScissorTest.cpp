@@ -165,6 +165,19 @@ TEST(UpdateRectangleScissor, WithoutAnAgeTheCentreDecides)
     EXPECT_FALSE(rectangle->IsFramebufferDirty());
 }
 
+TEST(UpdateRectangleScissor, CentreOfAnOddSizeIsRoundedDown)
+{
+    UpdateWindow window(OldTilingDevice());
+    UpdateRectangle rectangle;
+    rectangle.Init(window.surface.get(), 1079, 1919);
+
+    rectangle.IsFramebufferDirty();
+
+    const SimCall read = window.driver.LastCall("glReadPixels");
+    EXPECT_EQ(read.Arg(0), 539);
+    EXPECT_EQ(read.Arg(1), 959);
+}
+
 TEST(UpdateRectangleScissor, QuestionForAnAgeThatIsNotThereIsLoggedEachTime)
 {
     UpdateWindow window(PlainDevice().WithoutEglExtension("EGL_EXT_buffer_age"));

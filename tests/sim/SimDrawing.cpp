@@ -10,9 +10,12 @@ namespace Sim
 
 Box DrawArea(const GlState& gl, const Image& image)
 {
+    Box area = image.Area();
+    if (gl.tiling && gl.drawFramebuffer == 0)
+        area = Intersection(*gl.tiling, area);
     if (!gl.enabled.count(GL_SCISSOR_TEST))
-        return image.Area();
-    return Intersection({gl.scissor[0], gl.scissor[1], gl.scissor[2], gl.scissor[3]}, image.Area());
+        return area;
+    return Intersection({gl.scissor[0], gl.scissor[1], gl.scissor[2], gl.scissor[3]}, area);
 }
 
 namespace
@@ -103,14 +106,13 @@ void Invalidate(GlEntry& entry, GLenum target, GLsizei count, const GLenum* atta
     entry.List(attachments, count);
     if (!entry || !CheckFramebufferTarget(entry, target) || !CheckCount(entry, count))
         return;
-    const Color poison{kSimPoison[0] / 255.0, kSimPoison[1] / 255.0, kSimPoison[2] / 255.0,
-                       kSimPoison[3] / 255.0};
+    const Color undefined = Undefined(entry.state);
     for (GLsizei i = 0; i < count; ++i)
     {
         if (!IsInvalidatable(attachments[i], entry.Gl().drawFramebuffer == 0))
             return entry.Misuse(GL_INVALID_ENUM, "no such attachment: " + Hex(attachments[i]));
         if (Image* const image = ColorImage(entry, attachments[i]))
-            image->Fill(area.value_or(image->Area()), poison, kAllChannels);
+            image->Fill(area.value_or(image->Area()), undefined, kAllChannels);
     }
 }
 
@@ -160,8 +162,12 @@ SIM_API void glClear(GLbitfield mask)
     const GlState& gl = entry.Gl();
     for (Image* image : *images)
     {
-        if ((mask & GL_COLOR_BUFFER_BIT) != 0)
-            image->Fill(DrawArea(gl, *image), gl.clearColor, gl.colorMask);
+        if ((mask & GL_COLOR_BUFFER_BIT) == 0)
+            continue;
+        const Box area = DrawArea(gl, *image);
+        if (gl.drawFramebuffer == 0)
+            LoseTiles(entry.state, *entry.DrawSurface(), area);
+        image->Fill(area, gl.clearColor, gl.colorMask);
     }
     if ((mask & GL_DEPTH_BUFFER_BIT) != 0)
         ClearDepth(entry, gl.clearDepth);

@@ -4,6 +4,7 @@
 #include "SimCall.h"
 #include "SimGpu.h"
 #include "SimObjects.h"
+#include "SimSwapChain.h"
 
 #include <android/log.h>
 #include <android/native_window.h>
@@ -168,6 +169,8 @@ public:
     // --------------------------------------------------------------------------------------
     /// A new window of this size. It lives as long as the driver.
     ANativeWindow* Window(int width, int height);
+    /// How the buffers behave of surfaces that are made from now on.
+    void SetSwapChain(const SimSwapChain& chain);
     void ResizeWindow(ANativeWindow* window, int width, int height);
     /// From now on no surface can be made for this window, and swaps to it fail with
     /// EGL_BAD_NATIVE_WINDOW.
@@ -175,6 +178,8 @@ public:
     SimWindowState WindowState(ANativeWindow* window) const;
     /// The pixel that the user sees at (x, y) of the window, y counted from the bottom as in GL.
     SimPixel FrontPixel(ANativeWindow* window, int x, int y) const;
+    /// All pixels that the user sees, row by row, the bottom row first.
+    std::vector<SimPixel> FrontPixels(ANativeWindow* window) const;
     /// The pixel of the buffer that is drawn to.
     SimPixel BackPixel(ANativeWindow* window, int x, int y) const;
     /// The times that EGL_ANDROID_get_frame_timestamps reports; a name without a value is pending.

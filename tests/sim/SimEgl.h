@@ -30,6 +30,11 @@ void PresentRegion(State& state, Surface& surface, const Box& region);
 void ShowFrontBuffer(State& state, Surface& surface);
 /// Where drawing goes: the back buffer, or the front one in single-buffer mode.
 Image& DrawImage(State& state, Surface& surface);
+/// What pixels hold that nothing has defined.
+Color Undefined(const State& state);
+/// A clear is about to change @p area of the back buffer: what its tiles held is lost, where they
+/// are not loaded.
+void LoseTiles(State& state, Surface& surface, const Box& area);
 
 /// Fences of both kinds are passed: all of them.
 void SignalAll(State& state);

@@ -45,16 +45,13 @@ const SimConfig& ConfigOf(const State& state, const Surface& surface)
     return state.gpu.configs[static_cast<std::size_t>(surface.config)];
 }
 
-Image NewColorBuffer(int width, int height, bool poisoned)
+Image NewColorBuffer(int width, int height, const Color& content)
 {
     Image image;
     image.width = width;
     image.height = height;
     image.internalFormat = GL_RGBA8;
-    Color color{};
-    for (std::size_t i = 0; poisoned && i < 4; ++i)
-        color[i] = kSimPoison[i] / 255.0;
-    image.Fill(color);
+    image.Fill(content);
     return image;
 }
 
@@ -81,8 +78,9 @@ EGLSurface AddSurface(State& state, std::unique_ptr<Surface> surface)
 {
     const EGLSurface handle = state.NewHandle();
     surface->handle = handle;
-    surface->back = NewColorBuffer(surface->width, surface->height,
-                                   surface->window && state.gpu.poisonBackBuffers);
+    const bool poisoned = surface->window && state.gpu.poisonBackBuffers;
+    surface->back =
+        NewColorBuffer(surface->width, surface->height, poisoned ? Undefined(state) : Color{});
     state.surfaces[handle] = std::move(surface);
     return handle;
 }
@@ -221,7 +219,7 @@ SIM_API EGLSurface eglCreateWindowSurface(EGLDisplay display, EGLConfig config,
     surface->window = window;
     surface->width = target.width;
     surface->height = target.height;
-    target.front = NewColorBuffer(target.width, target.height, false);
+    target.front = NewColorBuffer(target.width, target.height, Color{});
     target.surface = AddSurface(entry.state, std::move(surface));
     return target.surface;
 }

@@ -1,5 +1,8 @@
 #include "SimExtensions.h"
 
+#include "SimEgl.h"
+#include "SimGl.h"
+
 #include <cstring>
 
 namespace
@@ -67,6 +70,23 @@ SIM_API Function eglGetProcAddress(const char* name)
     return present ? row->function : nullptr;
 }
 
+namespace
+{
+
+constexpr GLbitfield kColorBuffer0 = 0x1; // GL_COLOR_BUFFER_BIT0_QCOM
+
+/// What the tiled area held is gone, unless colour is preserved.
+void LoseTilingArea(Sim::GlEntry& entry, GLbitfield preserveMask)
+{
+    if ((preserveMask & kColorBuffer0) != 0 || entry.Gl().drawFramebuffer != 0 ||
+        !entry.DrawSurface())
+        return;
+    Sim::DrawImage(entry.state, *entry.DrawSurface())
+        .Fill(*entry.Gl().tiling, Sim::Undefined(entry.state), {true, true, true, true});
+}
+
+} // namespace
+
 // A frame may have several dirty rectangles, each of which starts a region, and every frame ends
 // one, started or not: out of order the calls are errors without blame.
 
@@ -78,7 +98,10 @@ void Sim::Extension::glStartTilingQCOM(GLuint x, GLuint y, GLuint width, GLuint 
         return;
     if (entry.Gl().tiling)
         return entry.Refuse(GL_INVALID_OPERATION);
-    entry.Gl().tiling = true;
+    const Box area{static_cast<int>(x), static_cast<int>(y), static_cast<int>(width),
+                   static_cast<int>(height)};
+    entry.Gl().tiling = area;
+    LoseTilingArea(entry, preserveMask);
 }
 
 void Sim::Extension::glEndTilingQCOM(GLbitfield preserveMask)
@@ -88,5 +111,6 @@ void Sim::Extension::glEndTilingQCOM(GLbitfield preserveMask)
         return;
     if (!entry.Gl().tiling)
         return entry.Refuse(GL_INVALID_OPERATION);
-    entry.Gl().tiling = false;
+    LoseTilingArea(entry, preserveMask);
+    entry.Gl().tiling.reset();
 }

@@ -8,6 +8,7 @@
 #include <deque>
 #include <map>
 #include <memory>
+#include <optional>
 #include <set>
 #include <string>
 #include <utility>
@@ -269,7 +270,7 @@ struct GlState
     bool feedbackActive = false;
     GLenum defaultReadBuffer = GL_BACK;
     std::vector<GLenum> defaultDrawBuffers{GL_BACK};
-    bool tiling = false; // between glStartTilingQCOM and glEndTilingQCOM
+    std::optional<Box> tiling; // between glStartTilingQCOM and glEndTilingQCOM: where is drawn
 
     GlState() { currentAttribs.fill({0, 0, 0, 1}); }
 };

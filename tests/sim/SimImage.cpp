@@ -30,12 +30,34 @@ void Image::Fill(const Color& color)
     EncodePixel(layout, color, m_fill.data());
 }
 
+/// As Fill, without looking at what was there.
+void Image::FillAll(const Box& inside, const Color& color)
+{
+    if (inside.width <= 0)
+        return;
+    const std::size_t size = PixelSize();
+    std::array<unsigned char, 16> pixel{};
+    EncodePixel(layout, color, pixel.data());
+    std::vector<unsigned char>& bytes = Bytes();
+    for (int y = inside.y; y < inside.y + inside.height; ++y)
+    {
+        unsigned char* to =
+            bytes.data() + (static_cast<std::size_t>(y) * static_cast<std::size_t>(width) +
+                            static_cast<std::size_t>(inside.x)) *
+                               size;
+        for (int x = 0; x < inside.width; ++x, to += size)
+            std::copy_n(pixel.data(), size, to);
+    }
+}
+
 void Image::Fill(const Box& area, const Color& color, const std::array<bool, 4>& mask)
 {
     const Box inside = Intersection(area, Area());
     const bool whole = inside.width == width && inside.height == height && depth == 1;
     if (whole && mask == std::array<bool, 4>{true, true, true, true})
         return Fill(color);
+    if (mask == std::array<bool, 4>{true, true, true, true})
+        return FillAll(inside, color);
     for (int y = inside.y; y < inside.y + inside.height; ++y)
     {
         for (int x = inside.x; x < inside.x + inside.width; ++x)

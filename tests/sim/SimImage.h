@@ -71,6 +71,7 @@ public:
     std::vector<unsigned char> CopyOfBytes() const;
 
 private:
+    void FillAll(const Box& inside, const Color& color);
     std::size_t PixelCount() const;
 
     std::vector<unsigned char> m_bytes; // empty: all pixels are m_fill

@@ -10,7 +10,14 @@ namespace Sim
 namespace
 {
 
-constexpr std::size_t kFramesKept = 4;
+/// Of frames that were presented, as many are kept as the oldest buffer may need.
+std::size_t FramesKept(const State& state)
+{
+    std::size_t kept = 4;
+    for (const int age : state.swapChain.ages)
+        kept = std::max(kept, static_cast<std::size_t>(std::max(age, 0)));
+    return kept;
+}
 
 NativeWindow* WindowOf(State& state, const Surface& surface)
 {
@@ -22,21 +29,13 @@ int NextAge(const State& state, const Surface& surface)
 {
     if (surface.swapBehavior == EGL_BUFFER_PRESERVED)
         return 1;
-    const std::vector<int>& ages = state.gpu.bufferAges;
+    const std::vector<int>& ages = state.swapChain.ages;
     if (!ages.empty())
     {
         const std::size_t frame = static_cast<std::size_t>(surface.frameCount);
         return ages[std::min(frame, ages.size() - 1)];
     }
     return surface.frameCount >= state.gpu.bufferCount ? state.gpu.bufferCount : 0;
-}
-
-Color Poison()
-{
-    Color color{};
-    for (std::size_t i = 0; i < 4; ++i)
-        color[i] = kSimPoison[i] / 255.0;
-    return color;
 }
 
 /// The back buffer of the next frame holds the frame presented `age` swaps ago.
@@ -47,9 +46,19 @@ void TakeNextBuffer(State& state, Surface& surface)
     if (surface.age > 0 && index < surface.frames.size())
         surface.back = surface.frames[index];
     else if (state.gpu.poisonBackBuffers)
-        surface.back.Fill(Poison());
+        surface.back.Fill(Undefined(state));
+    surface.clearedTiles.clear();
     surface.ageQueried = false;
     surface.damageSet = false;
+}
+
+/// The user sees @p drawn, in the damage alone where there is one.
+void Show(NativeWindow& window, const Image& drawn, const std::vector<Box>& damage)
+{
+    if (damage.empty())
+        window.front = drawn;
+    for (const Box& box : damage)
+        window.front.CopyFrom(drawn, Intersection(box, drawn.Area()));
 }
 
 /// A window that changed its size gets buffers of the new one, which hold nothing yet.
@@ -61,7 +70,7 @@ void FollowWindowSize(State& state, Surface& surface, NativeWindow& window)
     surface.height = window.height;
     surface.back.width = window.front.width = window.width;
     surface.back.height = window.front.height = window.height;
-    surface.back.Fill(state.gpu.poisonBackBuffers ? Poison() : Color{});
+    surface.back.Fill(state.gpu.poisonBackBuffers ? Undefined(state) : Color{});
     window.front.Fill(Color{});
     surface.frames.clear();
     surface.frameCount = 0;
@@ -70,11 +79,57 @@ void FollowWindowSize(State& state, Surface& surface, NativeWindow& window)
 
 } // namespace
 
+Color Undefined(const State& state)
+{
+    const SimPixel& pixel = state.swapChain.undefined;
+    return {pixel.r / 255.0, pixel.g / 255.0, pixel.b / 255.0, pixel.a / 255.0};
+}
+
 Image& DrawImage(State& state, Surface& surface)
 {
     NativeWindow* const window = WindowOf(state, surface);
     const bool single = window && surface.activeRenderBuffer == EGL_SINGLE_BUFFER;
     return single && surface.autoRefresh ? window->front : surface.back;
+}
+
+namespace
+{
+
+/// The first of the tiles along one axis that hold pixels from @p start, and the one behind the
+/// last; tiles are counted from the other end of @p screen when @p fromEnd.
+std::pair<int, int> TilesOf(int start, int length, int screen, int tileSize, bool fromEnd)
+{
+    const int first = fromEnd ? screen - start - length : start;
+    return {first / tileSize, (first + length + tileSize - 1) / tileSize};
+}
+
+int TileStart(int tile, int screen, int tileSize, bool fromEnd)
+{
+    return fromEnd ? screen - (tile + 1) * tileSize : tile * tileSize;
+}
+
+} // namespace
+
+void LoseTiles(State& state, Surface& surface, const Box& area)
+{
+    const SimSwapChain& chain = state.swapChain;
+    if (chain.tileSize <= 0 || area.width <= 0 || area.height <= 0)
+        return;
+    const int size = chain.tileSize;
+    const auto columns =
+        TilesOf(area.x, area.width, surface.back.width, size, chain.tilesFromRight);
+    const auto rows = TilesOf(area.y, area.height, surface.back.height, size, chain.tilesFromTop);
+    for (int row = rows.first; row < rows.second; ++row)
+    {
+        for (int column = columns.first; column < columns.second; ++column)
+        {
+            if (!surface.clearedTiles.insert({column, row}).second)
+                continue;
+            const int x = TileStart(column, surface.back.width, size, chain.tilesFromRight);
+            const int y = TileStart(row, surface.back.height, size, chain.tilesFromTop);
+            surface.back.Fill({x, y, size, size}, Undefined(state), {true, true, true, true});
+        }
+    }
 }
 
 void ShowFrontBuffer(State& state, Surface& surface)
@@ -91,12 +146,7 @@ void PresentFrame(State& state, Surface& surface, const std::vector<Box>& damage
         return;
     Image& drawn = DrawImage(state, surface);
     if (&drawn != &window->front)
-    {
-        if (damage.empty())
-            window->front = drawn;
-        for (const Box& box : damage)
-            window->front.CopyFrom(drawn, Intersection(box, drawn.Area()));
-    }
+        Show(*window, drawn, state.swapChain.damageIsAHint ? std::vector<Box>() : damage);
     ++window->presented;
     ++surface.frameCount;
     ++surface.nextFrameId;
@@ -107,7 +157,7 @@ void PresentFrame(State& state, Surface& surface, const std::vector<Box>& damage
         return;
     }
     surface.frames.insert(surface.frames.begin(), drawn);
-    if (surface.frames.size() > kFramesKept)
+    if (surface.frames.size() > FramesKept(state))
         surface.frames.pop_back();
     TakeNextBuffer(state, surface);
     FollowWindowSize(state, surface, *window);
@@ -122,6 +172,7 @@ void PresentRegion(State& state, Surface& surface, const Box& region)
     window->lastDamage = {region.x, region.y, region.width, region.height};
     ++window->presented;
     ++surface.nextFrameId;
+    surface.clearedTiles.clear();
 }
 
 namespace
@@ -246,6 +297,23 @@ SimPixel SimDriver::FrontPixel(ANativeWindow* window, int x, int y) const
 {
     const std::lock_guard lock(GetState().mutex);
     return ToPixel(GetState().windows.at(window)->front.Read(x, y));
+}
+
+std::vector<SimPixel> SimDriver::FrontPixels(ANativeWindow* window) const
+{
+    const std::lock_guard lock(GetState().mutex);
+    const std::vector<unsigned char> bytes = GetState().windows.at(window)->front.CopyOfBytes();
+    std::vector<SimPixel> pixels;
+    pixels.reserve(bytes.size() / 4);
+    for (std::size_t i = 0; i + 4 <= bytes.size(); i += 4)
+        pixels.push_back({bytes[i], bytes[i + 1], bytes[i + 2], bytes[i + 3]});
+    return pixels;
+}
+
+void SimDriver::SetSwapChain(const SimSwapChain& chain)
+{
+    const std::lock_guard lock(GetState().mutex);
+    GetState().swapChain = chain;
 }
 
 SimPixel SimDriver::BackPixel(ANativeWindow* window, int x, int y) const

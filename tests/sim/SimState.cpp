@@ -52,6 +52,7 @@ void State::Reset(SimGpu device)
 {
     static_cast<StateData&>(*this) = StateData{};
     gpu = std::move(device);
+    swapChain.ages = gpu.bufferAges;
 }
 
 void* State::NewHandle()

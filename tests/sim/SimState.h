@@ -64,7 +64,8 @@ struct Surface
     bool timestamps = false;
     bool postSubBuffer = false;
     Image back;
-    std::vector<Image> frames; // presented ones, the newest first
+    std::set<std::pair<int, int>> clearedTiles; // of this frame: column, row
+    std::vector<Image> frames;                  // presented ones, the newest first
     int frameCount = 0;
     int age = 0;
     bool ageQueried = false;
@@ -102,6 +103,7 @@ struct Failure
 struct StateData
 {
     SimGpu gpu;
+    SimSwapChain swapChain;
     bool driverAlive = false;
 
     bool recording = true;
