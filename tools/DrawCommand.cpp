@@ -2,6 +2,7 @@
 
 #include "Drawing.h"
 #include "DrawOptions.h"
+#include "LiveDrawing.h"
 #include "UserError.h"
 
 #include <memory>
@@ -11,12 +12,16 @@ namespace
 
 void Run(const DrawOptions& options)
 {
+    if (options.live)
+        return LiveDrawing(options).Run();
+    if (options.files.empty())
+        throw UserError("draw: FILE is required, unless --live opens an empty page");
     if (options.output.empty() && !options.window)
-        throw UserError("draw: say where to: -o PAGE.png, --window, or both");
+        throw UserError("draw: say where to: -o PAGE.png, --window, or both; or --live");
     if (options.exportedPages != 0 && options.output.empty())
         throw UserError("--export: say where to: -o PAGE.png");
     if (options.frontBuffer && !options.window)
-        throw UserError("--front-buffer: only a window has one; add --window");
+        throw UserError("--front-buffer: only a window has one; add --window or --live");
     Drawing(options).Run();
 }
 
@@ -27,11 +32,15 @@ void AddDrawCommand(CLI::App& app)
     CLI::App* const draw = app.add_subcommand("draw", "Draw recorded pen strokes");
     const auto options = std::make_shared<DrawOptions>();
     draw->add_option("FILE", options->files,
-                     "Recordings: InkML, tablet samples, pointer events; known by their content")
-        ->required();
+                     "Recordings: InkML, tablet samples, pointer events; known by their content");
     draw->add_option("-o,--output", options->output, "Write the page as PNG; needs no display");
     draw->add_flag("--window", options->window,
                    "Replay in a window of the X server named by DISPLAY");
+    CLI::Option* const live = draw->add_flag(
+        "--live", options->live,
+        "Draw with mouse and pen in a window, on top of FILE if there is one. Ctrl-Z takes the "
+        "last step back, Ctrl-N or Delete clears the page, Ctrl-S saves it as PAGE.png and "
+        "PAGE.inkml; with -o, closing the window saves it, too");
     draw->add_option("--size", options->size, "Page size in pixels, WIDTHxHEIGHT")
         ->capture_default_str();
     draw->add_option("--scale", options->scale,
@@ -62,5 +71,8 @@ void AddDrawCommand(CLI::App& app)
         ->check(CLI::Range(1, 10000));
     draw->add_option("--lose-context", options->loseContext,
                      "Draw on a background thread that loses its GL context; every:N samples");
+    for (const char* replay :
+         {"--window", "--speed", "--keep", "--json", "--export", "--lose-context"})
+        live->excludes(replay);
     draw->callback([options] { Run(*options); });
 }

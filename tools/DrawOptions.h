@@ -24,6 +24,7 @@ struct DrawOptions
     std::string loseContext; ///< "every:N"
     int exportedPages = 0;
     bool window = false;
+    bool live = false;
     bool keep = false;
     bool frontBuffer = false;
 };

@@ -40,9 +40,8 @@ float PenAxes::Degrees(const Range& tilt)
 void PenAxes::FillIn(Ink::Sample& sample) const
 {
     if (m_pressure)
-        sample.pressure = static_cast<float>(
-            std::clamp((m_pressure->value - m_pressure->min) / (m_pressure->max - m_pressure->min),
-                       0.0, 1.0));
+        sample.pressure = static_cast<float>(std::clamp(
+            (m_pressure->value - m_pressure->min) / (m_pressure->max - m_pressure->min), 0.0, 1.0));
     if (m_tiltX && m_tiltY)
         Ink::SetTilt(sample, Degrees(*m_tiltX), Degrees(*m_tiltY));
 }

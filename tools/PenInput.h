@@ -55,10 +55,10 @@ struct PenReport
         Up
     };
     Kind kind = Kind::Move;
-    int pointer = 0;            ///< the pointer on the screen
-    int device = 0;             ///< the device that moved it
+    int pointer = 0;                ///< the pointer on the screen
+    int device = 0;                 ///< the device that moved it
     std::uint32_t milliseconds = 0; ///< the server's clock, which starts again after 49 days
-    float x = 0.0f;             ///< window pixels, y downward
+    float x = 0.0f;                 ///< window pixels, y downward
     float y = 0.0f;
 
     /// The valuators that changed: bit n of @ref mask stands for valuator n, its value is the next

@@ -4,6 +4,8 @@
 #include <memory>
 #include <string>
 
+class XConnection;
+
 /// A window of the X server that DISPLAY names, of a fixed size, shown when the constructor
 /// returns. Used on one thread.
 class XWindow
@@ -23,8 +25,7 @@ public:
     bool IsOpen();
 
 private:
-    struct Connection;
-    std::unique_ptr<Connection> m_connection;
+    std::unique_ptr<XConnection> m_connection;
 };
 
 #endif

@@ -39,11 +39,12 @@ void InkSession::PostGuarded(Work work)
 }
 
 InkSession::InkSession(Nib::RenderThreadGL& thread, int width, int height, const Colour& paper)
-    : m_thread(thread), m_width(width), m_height(height), m_gl(std::make_shared<GlState>()),
-      m_dirty(0.0f, 0.0f, static_cast<float>(width), static_cast<float>(height))
+    : m_thread(thread), m_width(width), m_height(height), m_paper(paper),
+      m_gl(std::make_shared<GlState>())
 {
     PostGuarded([width, height, paper](GlState& gl)
                 { gl.page = std::make_unique<Page>(width, height, paper); });
+    Invalidate();
 }
 
 InkSession::~InkSession()
@@ -61,11 +62,12 @@ InkSession::~InkSession()
 
 void InkSession::AttachWindow(void* window)
 {
+    m_window = window;
     m_thread.OnSurfaceChanged(window, m_width, m_height, 0);
     PostGuarded(
         [width = m_width, height = m_height](GlState& gl)
         { gl.view = std::make_unique<PageView>(width, height, PageView::Surface::Window); });
-    m_dirty.Set(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
+    Invalidate();
 }
 
 void InkSession::AttachScreen()
@@ -73,6 +75,32 @@ void InkSession::AttachScreen()
     PostGuarded(
         [width = m_width, height = m_height](GlState& gl)
         { gl.view = std::make_unique<PageView>(width, height, PageView::Surface::Screen); });
+    Invalidate();
+}
+
+void InkSession::Resize(int width, int height)
+{
+    m_width = width;
+    m_height = height;
+    PostGuarded(
+        [width, height, paper = m_paper](GlState& gl)
+        {
+            gl.painter = InkPainter(); // its brushes are made for pages of one size
+            gl.page = std::make_unique<Page>(width, height, paper);
+        });
+    if (m_window)
+        AttachWindow(m_window);
+    Invalidate();
+}
+
+void InkSession::Clear()
+{
+    PostGuarded([](GlState& gl) { gl.page->Clear(); });
+    Invalidate();
+}
+
+void InkSession::Invalidate()
+{
     m_dirty.Set(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
 }
 

@@ -42,6 +42,15 @@ public:
     /// Without a window, frames go to an offscreen screen of the page's size. Never blocks.
     void AttachScreen();
 
+    /// Gives the page, which becomes blank, and the window, if there is one, another size. [blocks]
+    void Resize(int width, int height);
+
+    /// Takes all ink off the page. Never blocks.
+    void Clear();
+
+    /// The next frame shows the whole page again: the window has lost what it showed.
+    void Invalidate();
+
     /// Paints a piece of a stroke onto the page; it is not shown yet. Never blocks.
     void Draw(InkPiece piece);
 
@@ -77,6 +86,8 @@ private:
     Nib::RenderThreadGL& m_thread;
     int m_width;
     int m_height;
+    Colour m_paper;
+    void* m_window = nullptr;
     std::shared_ptr<GlState> m_gl; // its contents are touched on the render thread alone
     long long m_tasks = 0;
     Nib::RectF m_dirty; // page pixels, y downward; what changed since the last frame

@@ -247,7 +247,7 @@ TEST_F(Draw, BadOptionsAreNamed)
     EXPECT_EQ(error({"--scale", "2"}), "nib: --scale: 2 not in {fit,1:1}\n");
     EXPECT_EQ(error({"--colour"}), "nib: The following argument was not expected: --colour\n");
     EXPECT_EQ(RunNib({"draw", NIB_SAMPLE}).err,
-              "nib: draw: say where to: -o PAGE.png, --window, or both\n");
+              "nib: draw: say where to: -o PAGE.png, --window, or both; or --live\n");
 }
 
 TEST_F(Draw, UnwritableOutputIsNamed)

@@ -14,7 +14,7 @@ using Kind = PenReport::Kind;
 /// A pen as common drivers describe it, with its axes in an order of their own.
 std::vector<PenAxis> PenWithTilt()
 {
-    return {{0, "Abs X", 0.0, 21600.0, 0.0},      {1, "Abs Y", 0.0, 13500.0, 0.0},
+    return {{0, "Abs X", 0.0, 21600.0, 0.0},       {1, "Abs Y", 0.0, 13500.0, 0.0},
             {2, "Abs Pressure", 0.0, 2048.0, 0.0}, {3, "Abs Tilt X", -64.0, 63.0, 0.0},
             {4, "Abs Tilt Y", -64.0, 63.0, 0.0},   {5, "Abs Wheel", -900.0, 899.0, 0.0}};
 }
@@ -111,8 +111,8 @@ TEST(PenInput, TiltIsInDegrees)
         float azimuth, altitude;
     };
     const Row rows[] = {
-        {0.0, 0.0, 0.0f, 90.0f},    {30.0, 0.0, 0.0f, 60.0f},   {-30.0, 0.0, 180.0f, 60.0f},
-        {0.0, 45.0, 90.0f, 45.0f},  {0.0, -45.0, 270.0f, 45.0f}, {45.0, 45.0, 45.0f, 35.26439f},
+        {0.0, 0.0, 0.0f, 90.0f},     {30.0, 0.0, 0.0f, 60.0f},    {-30.0, 0.0, 180.0f, 60.0f},
+        {0.0, 45.0, 90.0f, 45.0f},   {0.0, -45.0, 270.0f, 45.0f}, {45.0, 45.0, 45.0f, 35.26439f},
         {-60.0, 0.0, 180.0f, 30.0f},
     };
     for (const Row& row : rows)

@@ -63,6 +63,17 @@ std::string RunningNib::ReadLine()
     return line;
 }
 
+void RunningNib::Stop() const
+{
+    kill(m_process, SIGSTOP);
+    waitpid(m_process, nullptr, WUNTRACED);
+}
+
+void RunningNib::Continue() const
+{
+    kill(m_process, SIGCONT);
+}
+
 NibResult RunningNib::Finish()
 {
     NibResult result;

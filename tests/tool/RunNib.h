@@ -29,6 +29,9 @@ public:
     /// The next line of its standard output; empty at its end.
     std::string ReadLine();
 
+    void Stop() const; ///< it takes nothing in until Continue
+    void Continue() const;
+
     NibResult Finish();
 
 private:
