@@ -419,6 +419,11 @@ struct Verdict
     bool frontBuffer; // with all that EGL has to give
 };
 
+void PrintTo(const Verdict& verdict, std::ostream* out)
+{
+    *out << verdict.renderer;
+}
+
 const Verdict kVerdicts[] = {
     {"Adreno (TM) 305", true, true},  {"Adreno (TM) 306", true, true},
     {"Adreno (TM) 308", true, true},  {"Adreno (TM) 330", true, true},

@@ -102,6 +102,11 @@ struct PixelPair
     const char* sample;
 };
 
+void PrintTo(const PixelPair& pair, std::ostream* out)
+{
+    *out << pair.name;
+}
+
 const PixelPair kPairs[] = {
     {"R8", 0, 0, 1, Storage::Byte, kSampleColor},
     {"SingleR8", 3, 0, 1, Storage::Byte, kSampleColor},

@@ -132,6 +132,20 @@ TEST_F(HwuiTest, DeletionWithoutAContextDeletesTheTasksUnrun)
     context->MakeCurrent();
 }
 
+TEST_F(HwuiTest, DeletionWithoutAContextDeletesTheTasksOfTheOtherQueueToo)
+{
+    int ran = 0;
+    auto token = std::make_shared<int>(0);
+    Post(Queue(), [&ran, token] { ++ran; }); // no frame yet: behind the first task
+    context->Release();
+
+    thread.reset();
+
+    EXPECT_EQ(ran, 0);
+    EXPECT_EQ(token.use_count(), 1);
+    context->MakeCurrent();
+}
+
 TEST_F(HwuiTest, DeletionOfAThreadThatNeverDrewRunsItsInit)
 {
     driver.ForgetLog();

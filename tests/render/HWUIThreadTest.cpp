@@ -75,6 +75,19 @@ TEST_F(HwuiTest, InitIsTheFirstTaskOfTheFirstFrame)
                                   Hex(thread.get()) + ", Context: " + Hex(context->Handle())}));
 }
 
+TEST(HwuiInit, ReadsTheGLParametersWhenNobodyHas)
+{
+    SimDriver driver;
+    SimContext context(driver);
+    HwuiCallback callback{};
+    GLES::HWUIThreadGLImpl thread(&callback, "hwui");
+    EXPECT_FALSE(OpenGLRenderer::IsGLParameterInited());
+
+    thread.Render();
+
+    EXPECT_TRUE(OpenGLRenderer::IsGLParameterInited());
+}
+
 // ---- what it does not do ------------------------------------------------------------------------
 
 TEST_F(HwuiTest, StartDoesNothing)

@@ -40,6 +40,11 @@ struct Row
     int tileSize;
 };
 
+void PrintTo(const Row& row, std::ostream* out)
+{
+    *out << row.renderer << ", level " << row.sdk;
+}
+
 SimGpu DeviceOf(const Row& row)
 {
     const SimGpu gpu = SimGpu::Named(row.renderer);

@@ -11,8 +11,10 @@ namespace
 {
 
 std::atomic<int> g_signals{0};
+std::atomic<int> g_waits{0};
 
 constexpr const char* kSignalSymbol = "_ZN3Nib19ConditionalVariable6SignalEv";
+constexpr const char* kWaitSymbol = "_ZN3Nib19ConditionalVariable4WaitEPNS_15CriticalSectionEi";
 
 } // namespace
 
@@ -32,6 +34,25 @@ int SignalsSoFar()
 void WaitForSignals(int before, int more)
 {
     while (SignalsSoFar() < before + more)
+        std::this_thread::yield();
+}
+
+bool Nib::ConditionalVariable::Wait(CriticalSection* section, int milliseconds) noexcept
+{
+    using Real = bool (*)(ConditionalVariable*, CriticalSection*, int);
+    static const Real real = reinterpret_cast<Real>(dlsym(RTLD_NEXT, kWaitSymbol));
+    g_waits.fetch_add(1); // under the section, which is left when the wait has begun
+    return real(this, section, milliseconds);
+}
+
+int WaitsSoFar()
+{
+    return g_waits.load();
+}
+
+void WaitForWaits(int before, int more)
+{
+    while (WaitsSoFar() < before + more)
         std::this_thread::yield();
 }
 

@@ -161,6 +161,13 @@ int SignalsSoFar();
 /// Waits until that many more signals than @p before were sent.
 void WaitForSignals(int before, int more);
 
+/// How often a wait for any condition was begun since the start of the process. Who then enters the
+/// section of that wait finds the waiter asleep.
+int WaitsSoFar();
+
+/// Returns once that many more waits than @p before were begun.
+void WaitForWaits(int before, int more);
+
 /// How often the calling thread has allocated since the start of the process.
 long AllocationsSoFar();
 

@@ -434,6 +434,21 @@ TEST_F(WorkerThread, TasksWaitWhileItIsPaused)
     EXPECT_EQ(record.Entries(), Numbers({0, 1, 2}));
 }
 
+TEST_F(WorkerThread, AWakeUpDoesNotMakeAPausedWorkerTouchItsQueue)
+{
+    FollowedWorker paused;
+    const int before = WaitsSoFar();
+    paused.Start(kPaused);
+    paused.EnqueueAsyncTask(record.NewTask(1));
+    WaitForWaits(before, 1);
+
+    paused.Wakeup();
+    WaitForWaits(before, 2); // it went back to sleep
+
+    EXPECT_EQ(record.Entries(), Numbers({}));
+    paused.Resume();
+}
+
 TEST_F(WorkerThread, PauseIsAlwaysTrue)
 {
     EXPECT_TRUE(worker->Pause());
