@@ -37,6 +37,10 @@ target_compile_options(NibBuildFlags INTERFACE
     -ffp-contract=off
     $<$<BOOL:${NIB_WERROR}>:-Werror>
     $<$<CXX_COMPILER_ID:Clang>:-Wthread-safety -Wthread-safety-beta>)
+if(ANDROID)
+    # Devices with pages of 16 KiB load only libraries whose segments are aligned to them.
+    target_link_options(NibBuildFlags INTERFACE -Wl,-z,max-page-size=16384)
+endif()
 if(NIB_SANITIZE)
     target_compile_options(NibBuildFlags INTERFACE
         -fsanitize=${NIB_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
