@@ -258,6 +258,47 @@ TEST_F(SafeLock, WaitsAreRequestsAgainOnceTheUiHasTheLock)
     EXPECT_EQ(requests, 1);
 }
 
+TEST_F(SafeLock, AnOwnerThatWaitsWhileAnotherThreadDoesAsksForFramesAllTheSame)
+{
+    constexpr int kTries = 300;
+    thread->Render();
+    ready = false; // every request is refused, so that no wait needs a frame
+    int refused = 0;
+    std::atomic<bool> done{false};
+    std::thread owner(
+        [&]
+        {
+            Lock()->Lock(false);
+            Event otherComes;
+            std::thread other(
+                [&]
+                {
+                    otherComes.Set();
+                    Lock()->Lock(false);
+                    Lock()->Unlock();
+                });
+            otherComes.Wait();
+            for (int i = 0; i < kTries; ++i)
+            {
+                refused += Queue()->waitForCompleting() ? 0 : 1;
+                std::this_thread::yield();
+            }
+            Lock()->Unlock();
+            other.join();
+            done = true;
+        });
+
+    while (!done)
+    {
+        thread->Render(); // a wait that no request was made for would last until a frame
+        std::this_thread::yield();
+    }
+
+    owner.join();
+    EXPECT_EQ(refused, kTries);
+    EXPECT_EQ(requests, kTries);
+}
+
 TEST_F(SafeLock, AskedForOrdinarilyTheUiDoesNotDraw)
 {
     thread->Render();
