@@ -18,6 +18,7 @@ namespace
 {
 
 constexpr int kNoTimeOut = -1;
+constexpr const ITask* kNoTask = nullptr;
 
 /// Has the shared render thread read the GL parameters, which need a context of their own kind.
 void ReadGLParameters()
@@ -43,6 +44,7 @@ HWUIThreadGLImpl::HWUIThreadGLImpl(HwuiCallback* callback, const char* tag)
 {
     NIB_LOG_INFO("HWUIThreadGLImpl::HWUIThreadGLImpl Constructor : %p", static_cast<void*>(this));
     m_observer = HWUIObjectObserver::GetInstance();
+    ReadWatchdogEnvironment();
     Post(NewTask(this, &HWUIThreadGLImpl::Init));
 }
 
@@ -132,6 +134,7 @@ bool HWUIThreadGLImpl::Render()
     if (m_waiting)
     {
         m_waiting = false;
+        WatchedCall::Answer(m_watched, kNoTask);
         NIB_LOG_DEBUG("%s - Signal m_waitForCompletingCV", function);
         m_waitForCompletingCV.SignalAll();
     }
@@ -152,6 +155,7 @@ void HWUIThreadGLImpl::RunTasks(TaskQueue* queue)
     int count = 0;
     while (const std::unique_ptr<ITask> task{queue->Pop()})
     {
+        const WatchedCall call(WatchedCall::Kind::Run, m_watched, task.get());
         task->run();
         ++count;
     }
@@ -187,6 +191,7 @@ bool HWUIThreadGLImpl::waitForCompleting()
 
 bool HWUIThreadGLImpl::WaitForNextFrame(const char* function)
 {
+    const WatchedCall wait(m_watched, "draw its next frame");
     AutoCriticalSection lock(m_waitLock);
     if (m_lockRequested)
     {
@@ -214,6 +219,7 @@ void HWUIThreadGLImpl::Lock(bool invokeIfNeeded)
         ++m_lockCount;
         return;
     }
+    const WatchedCall wait(m_watchedLock, "leave its safe lock");
     AutoCriticalSection lock(m_waitLock);
     if (m_lockOwner.load(std::memory_order_relaxed) == 0)
         return TakeSafeLock();

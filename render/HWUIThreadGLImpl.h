@@ -4,6 +4,7 @@
 #include "base/ThreadAnnotations.h"
 #include "render/HWUIObjectObserver.h"
 #include "thread/TaskQueue.h"
+#include "thread/WatchedCall.h"
 
 #include <nib/base.h>
 #include <nib/render_thread.h>
@@ -93,6 +94,8 @@ private:
     int m_lockCount = 0; // the owner's
     bool m_lockRequested NIB_GUARDED_BY(m_waitLock) =
         false; // somebody who can draw waits for the lock
+    const WatchTarget m_watched{m_tag, &m_hwuiThreadId, nullptr};
+    const WatchTarget m_watchedLock{m_tag, nullptr, nullptr}; // its owner may be any thread
 };
 
 } // namespace Nib::GLES

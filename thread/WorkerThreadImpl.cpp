@@ -82,6 +82,7 @@ WorkerThreadImpl::WorkerThreadImpl(const char* name, Thread::ThreadPriority prio
     NIB_FUNCTION("Nib::WorkerThreadImpl::WorkerThreadImpl(const char *, "
                  "Thread::ThreadPriority, bool)");
     NIB_LOG_INFO("%s Initialize", function);
+    ReadWatchdogEnvironment();
 }
 
 WorkerThreadImpl::~WorkerThreadImpl()
@@ -124,6 +125,7 @@ void WorkerThreadImpl::Terminate()
     RunSyncTask(&terminateTask, !kAheadOfQueue, !kDeleteAfterRun);
     const std::unique_ptr<Thread> thread(m_thread.load(std::memory_order_acquire));
     thread->join();
+    m_threadNumber.store(0, std::memory_order_relaxed);
     m_thread.store(nullptr, std::memory_order_release);
     m_quit.store(false, std::memory_order_relaxed);
     // What came behind the last task stays linked; the next start counts it again. An exchange, so
@@ -197,6 +199,7 @@ bool WorkerThreadImpl::WaitForExecution(int* queuedAfter)
 
 void WorkerThreadImpl::RunSyncTask(ITask* task, bool aheadOfQueue, bool deleteAfterRun)
 {
+    const WatchedCall wait(WatchedCall::Kind::Wait, m_watched, task);
     AutoCriticalSection outer(m_outerLock);
     AutoCriticalSection sync(m_syncLock);
     if (aheadOfQueue)
@@ -219,7 +222,9 @@ void WorkerThreadImpl::RunSyncTask(ITask* task, bool aheadOfQueue, bool deleteAf
 
 void WorkerThreadImpl::ThreadProcedure(void* worker)
 {
-    static_cast<WorkerThreadImpl*>(worker)->RunUntilQuit();
+    auto* self = static_cast<WorkerThreadImpl*>(worker);
+    self->m_threadNumber.store(GetNibCurrentThreadId(), std::memory_order_relaxed);
+    self->RunUntilQuit();
 }
 
 void WorkerThreadImpl::RunUntilQuit()
@@ -272,6 +277,7 @@ bool WorkerThreadImpl::RunSynchronously(std::atomic<ITask*>& task, bool deleteAf
     AutoCriticalSection lock(m_syncLock);
     ITask* const run = task.load(std::memory_order_acquire);
     RunGuarded(run);
+    WatchedCall::Answer(m_watched, run);
     if (deleteAfterRun)
         delete run;
     task.store(nullptr, std::memory_order_release);
@@ -281,6 +287,7 @@ bool WorkerThreadImpl::RunSynchronously(std::atomic<ITask*>& task, bool deleteAf
 
 void WorkerThreadImpl::RunGuarded(ITask* task)
 {
+    const WatchedCall call(WatchedCall::Kind::Run, m_watched, task);
     if (!m_globalLock || !task->isGlobalLockAllowed())
         return task->run();
     AutoCriticalSection guard(GlobalLocker::m_guard);

@@ -3,6 +3,7 @@
 
 #include "base/ThreadAnnotations.h"
 #include "thread/TaskQueue.h"
+#include "thread/WatchedCall.h"
 
 #include <nib/base.h>
 #include <nib/worker_thread.h>
@@ -76,7 +77,9 @@ private:
     std::atomic<ITask*> m_directTask{nullptr}; // filled under m_syncLock, looked at without it
     bool m_deleteDirectTask = false;           // published by m_directTask
     const Thread::ThreadPriority m_priority;
-    const char* const m_name; // the caller's
+    const char* const m_name;                     // the caller's
+    std::atomic<std::uint64_t> m_threadNumber{0}; // the system's, 0 without a thread
+    const WatchTarget m_watched{m_name, &m_threadNumber, &m_paused};
 };
 
 } // namespace Nib

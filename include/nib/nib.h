@@ -27,6 +27,7 @@
 #include <nib/task.h>
 #include <nib/texture.h>
 #include <nib/version.h>
+#include <nib/watchdog.h>
 #include <nib/worker_thread.h>
 
 #endif

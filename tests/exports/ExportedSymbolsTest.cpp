@@ -111,6 +111,8 @@ constexpr std::array kThreads = {
     "Nib::IWorkerThread::CreateInstance_NoLock(char const*, int)",
     "Nib::IWorkerThread::CreateInstance_GlobalLock(char const*, int)",
     "Nib::IWorkerThread::CreatePoolInstance(char const*, int, int)",
+    "Nib::Watchdog::SetLimit(int)",
+    "Nib::Watchdog::GetLimit()",
     "Nib::AttachToThread(Nib::IGLMsgQueue*)",
     "Nib::GetCurrentMsgQueue()",
     "Nib::IGLMsgQueue::setTearingAllowed(bool)",
