@@ -1,0 +1,7 @@
+// The library's own code, on modelled atomics.
+
+#include "ModelAtomic.h"
+
+#include "thread/GlobalLocker.cpp"
+#include "thread/Task.cpp"
+#include "thread/WorkerThreadImpl.cpp"
