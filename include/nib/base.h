@@ -15,6 +15,7 @@
 
 #include <pthread.h>
 
+/// @cond
 // Clang's thread-safety attributes: with -Wthread-safety the compiler checks that locks are left
 // by whoever entered them. Nothing under other compilers.
 #if defined(__clang__)
@@ -22,6 +23,7 @@
 #else
 #define NIB_LOCK_ATTRIBUTE(x)
 #endif
+/// @endcond
 
 namespace Nib
 {
@@ -39,6 +41,7 @@ public:
     /// the inherited one where the system refuses (on Linux, below 0 for ordinary users).
     using ThreadPriority = int;
 
+    /// What a thread runs.
     using Procedure = void (*)(void* argument);
 
     /// As wide as pthread_t; 0 is never the handle of a thread.
@@ -231,7 +234,7 @@ class NIB_EXPORT String
 {
 public:
     String() = default;
-    explicit String(const char* text) { Construct(text); }
+    explicit String(const char* text) { Construct(text); } ///< as Construct
 
     /// Takes a copy of @p text. False for null, which leaves an empty text.
     bool Construct(const char* text);
@@ -242,10 +245,16 @@ public:
     /// In bytes.
     std::size_t GetLength() const noexcept { return m_text.size(); }
 
-    bool IsEmpty() const noexcept { return m_text.empty(); }
+    bool IsEmpty() const noexcept { return m_text.empty(); } ///< whether it has no characters
 
-    friend bool operator==(const String& a, const String& b) { return a.m_text == b.m_text; }
-    friend bool operator!=(const String& a, const String& b) { return a.m_text != b.m_text; }
+    friend bool operator==(const String& a, const String& b)
+    {
+        return a.m_text == b.m_text;
+    } ///< by their characters
+    friend bool operator!=(const String& a, const String& b)
+    {
+        return a.m_text != b.m_text;
+    } ///< by their characters
 
 private:
     std::string m_text;
@@ -287,12 +296,14 @@ public:
 
     /// Removes a file; 0, or -1 on failure.
     static int Unlink(const String* path);
+    /// As above, for a path.
     static int Unlink(const char* path);
 
 private:
     int m_descriptor = -1;
 };
 
+/// Folders.
 class NIB_EXPORT Directory
 {
 public:
@@ -309,22 +320,32 @@ struct Rect;
 /// and bottom are outside.
 struct NIB_EXPORT RectF
 {
-    float left = 0;
-    float top = 0;
-    float right = 0;
-    float bottom = 0;
+    float left = 0;   ///< the smaller x
+    float top = 0;    ///< the smaller y
+    float right = 0;  ///< the larger x, not within
+    float bottom = 0; ///< the larger y, not within
 
     constexpr RectF() noexcept = default;
+    /// The four edges: left, top, right, bottom.
     constexpr RectF(float l, float t, float r, float b) noexcept
         : left(l), top(t), right(r), bottom(b)
     {
     }
 
-    constexpr float Width() const noexcept { return right - left; }
-    constexpr float Height() const noexcept { return bottom - top; }
-    constexpr bool IsEmpty() const noexcept { return left >= right || top >= bottom; }
+    constexpr float Width() const noexcept
+    {
+        return right - left;
+    } ///< negative where the edges are swapped
+    constexpr float Height() const noexcept
+    {
+        return bottom - top;
+    } ///< negative where the edges are swapped
+    constexpr bool IsEmpty() const noexcept
+    {
+        return left >= right || top >= bottom;
+    } ///< without area
 
-    void Set(float l, float t, float r, float b) noexcept;
+    void Set(float l, float t, float r, float b) noexcept; ///< left, top, right, bottom
 
     /// Clips this to @p other and returns true, or returns false and changes nothing when they have
     /// no area in common.
@@ -341,11 +362,13 @@ struct NIB_EXPORT RectF
     void ExtendRect() noexcept;
 };
 
+/// Equal in all four edges.
 constexpr bool operator==(const RectF& a, const RectF& b) noexcept
 {
     return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
 }
 
+/// Different in an edge.
 constexpr bool operator!=(const RectF& a, const RectF& b) noexcept
 {
     return !(a == b);
@@ -354,30 +377,42 @@ constexpr bool operator!=(const RectF& a, const RectF& b) noexcept
 /// A rectangle in whole pixels; right and bottom are outside.
 struct NIB_EXPORT Rect
 {
-    int left = 0;
-    int top = 0;
-    int right = 0;
-    int bottom = 0;
+    int left = 0;   ///< the smaller x
+    int top = 0;    ///< the smaller y
+    int right = 0;  ///< the larger x, not within
+    int bottom = 0; ///< the larger y, not within
 
     constexpr Rect() noexcept = default;
-    constexpr Rect(int l, int t, int r, int b) noexcept : left(l), top(t), right(r), bottom(b) {}
+    constexpr Rect(int l, int t, int r, int b) noexcept
+        : left(l), top(t), right(r), bottom(b) {} ///< left, top, right, bottom
 
-    constexpr int Width() const noexcept { return right - left; }
-    constexpr int Height() const noexcept { return bottom - top; }
-    constexpr bool IsEmpty() const noexcept { return left >= right || top >= bottom; }
+    constexpr int Width() const noexcept
+    {
+        return right - left;
+    } ///< negative where the edges are swapped
+    constexpr int Height() const noexcept
+    {
+        return bottom - top;
+    } ///< negative where the edges are swapped
+    constexpr bool IsEmpty() const noexcept
+    {
+        return left >= right || top >= bottom;
+    } ///< without area
 
-    void Set(int l, int t, int r, int b) noexcept;
+    void Set(int l, int t, int r, int b) noexcept; ///< left, top, right, bottom
 
     /// Truncates towards zero. What no int can hold becomes the nearest one that can, and what is
     /// not a number becomes 0.
     Rect& operator=(const RectF& other) noexcept;
 };
 
+/// Equal in all four edges.
 constexpr bool operator==(const Rect& a, const Rect& b) noexcept
 {
     return a.left == b.left && a.top == b.top && a.right == b.right && a.bottom == b.bottom;
 }
 
+/// Different in an edge.
 constexpr bool operator!=(const Rect& a, const Rect& b) noexcept
 {
     return !(a == b);
@@ -398,10 +433,12 @@ class NIB_EXPORT System
 public:
     /// The Android API level. Behaviour differs below 29 and from 29 on.
     static int GetSDKVersion();
+    /// Sets what GetSDKVersion answers from now on.
     static void SetSDKVersion(int version);
 
     /// Whether debugging aids are on.
     static bool IsBuildTypeEngMode();
+    /// Sets what IsBuildTypeEngMode answers from now on.
     static void SetBuildTypeEngMode(bool on);
 
     /// The folder beside which the binary shader cache is kept, or null: no cache on disk. The text
@@ -414,6 +451,7 @@ public:
     /// Whether configurations that desktop drivers lack are replaced by the nearest they have.
     /// Asked for when the EGL display is first used.
     static bool GetDesktopFallbacks();
+    /// Sets what GetDesktopFallbacks answers; before the first use of Egl.
     static void SetDesktopFallbacks(bool on);
 };
 

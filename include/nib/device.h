@@ -144,10 +144,10 @@ public:
     /// A rectangle of window coordinates in pixels, the origin at the lower left.
     struct Viewport
     {
-        int x;
-        int y;
-        int width;
-        int height;
+        int x;      ///< of the left edge
+        int y;      ///< of the lower edge
+        int width;  ///< of the rectangle
+        int height; ///< of the rectangle
     };
 
     OpenGLRenderer() = delete;
@@ -157,6 +157,7 @@ public:
     /// Reads the limits and names of the implementation, once per process. Every render thread
     /// calls it when its context is current for the first time.
     static void InitParameters();
+    /// Whether InitParameters has run.
     static bool IsGLParameterInited();
 
     /// The largest width of a texture that can also be drawn into, in pixels; 8192 before
@@ -190,6 +191,7 @@ public:
 
     /// Whether InitOpenGLExtensions found the entry points; writes a line when it did.
     static bool checkQCOMTilingSupport();
+    /// The GL mask of the buffers that @p mask names.
     static unsigned getTilingMaskQCOM(int mask);
 
     /// Begins tiled rendering of a rectangle, in pixels from the lower left; the tiles start with
@@ -212,26 +214,42 @@ public:
 
     // ---- state, one GL call each ----
 
+    /// glClearColor
     static void setClearColor(float r, float g, float b, float a);
+    /// glClearDepthf
     static void setClearDepth(float value);
     static void setClearStencil(float value); ///< truncated toward zero
+    /// glClear of the buffers that are named.
     static void clear(bool color, bool depth, bool stencil);
+    /// glEnable
     static void enableState(RenderState state);
+    /// glDisable
     static void disableState(RenderState state);
     static void storeState(unsigned state); ///< does nothing, on purpose
     static void loadState(unsigned state);  ///< does nothing, on purpose
+    /// glBlendEquationSeparate
     static void setBlendEquation(BlendingFuncOld rgb, BlendingFuncOld alpha);
+    /// glBlendFuncSeparate
     static void setBlendFuncFactors(BlendingFactorOld srcRgb, BlendingFactorOld dstRgb,
                                     BlendingFactorOld srcAlpha, BlendingFactorOld dstAlpha);
+    /// glStencilFuncSeparate
     static void setStencilFunc(FaceMode face, DSFunc function, int ref, unsigned mask);
+    /// glStencilOpSeparate
     static void setStencilAction(FaceMode face, StencilAction sfail, StencilAction dpfail,
                                  StencilAction dppass);
+    /// glStencilMaskSeparate
     static void setStencilMask(FaceMode face, unsigned mask);
+    /// glCullFace
     static void setCullingSide(FaceMode face);
+    /// glDepthFunc
     static void setDepthFunc(DSFunc function);
+    /// glColorMask, all channels alike, and glDepthMask
     static void setWriteMask(bool color, bool depth);
+    /// glViewport
     static void setViewport(int x, int y, unsigned width, unsigned height);
+    /// glScissor
     static void setScissor(int x, int y, unsigned width, unsigned height);
+    /// GL_VIEWPORT
     static Viewport getViewport();
 
     /// Reads a rectangle of the bound framebuffer, in pixels from the lower left, into @p pixels.
@@ -239,6 +257,7 @@ public:
                            TextureTargetLayout layout, TextureMemoryLayout memoryLayout);
 
     static void activateTextureUnit2D(int unit, int texture); ///< leaves @p unit active
+    /// glBindFramebuffer
     static void bindFramebuffer(FramebufferTarget target, unsigned name);
 
     /// Sets one value of the read-back layout; the value that it replaces goes to @p previous,

@@ -19,6 +19,7 @@ namespace Nib
 class NIB_EXPORT EglSyncObject
 {
 public:
+    /// How a wait ended.
     enum class WaitResult : int
     {
         Passed = 0,   ///< the GPU has passed the fence
@@ -26,6 +27,7 @@ public:
         Failed = 2,   ///< EGL refused, or there is no fence
     };
 
+    /// Where a fence stands.
     enum class ObjectState : int
     {
         Unknown = -1,    ///< EGL refused, or there is no fence
@@ -62,6 +64,7 @@ using EglTime = std::int64_t;
 class NIB_EXPORT EglFrameTime
 {
 public:
+    /// A moment in the life of a frame.
     enum class FrameTimestamp : unsigned
     {
         RequestedPresentTime = 0,
@@ -75,6 +78,7 @@ public:
         ReadsDoneTime = 8,
     };
 
+    /// A time of the compositor.
     enum class CompositorTiming : unsigned
     {
         CompositeDeadline = 0,
@@ -93,7 +97,9 @@ public:
 
     virtual ~EglFrameTime();
 
+    /// Whether the surface gives a time of the frame.
     virtual bool IsTimestampSupported(FrameTimestamp timestamp) const = 0;
+    /// Whether the surface gives a time of the compositor.
     virtual bool IsCompositorTimingSupported(CompositorTiming timing) const = 0;
 
     /// A time of the frame; 0 when EGL refuses.

@@ -18,11 +18,12 @@ namespace Nib
 class NIB_EXPORT InvalidArgumentException : public std::exception
 {
 public:
+    /// @p message is what what() gives.
     explicit InvalidArgumentException(const std::string& message);
     ~InvalidArgumentException() override;
 
     /// The message.
-    const char* what() const noexcept override;
+    const char* what() const noexcept override; ///< the text of the exception
 
 private:
     std::runtime_error m_message; // copies without allocating
@@ -33,7 +34,7 @@ class NIB_EXPORT NotSupportedException : public std::exception
 {
 public:
     ~NotSupportedException() override;
-    const char* what() const noexcept override;
+    const char* what() const noexcept override; ///< the text of the exception
 };
 
 /// "Required OpenGL version not supported!"
@@ -41,7 +42,7 @@ class NIB_EXPORT OGLVersionNotSupportedException : public std::exception
 {
 public:
     ~OGLVersionNotSupportedException() override;
-    const char* what() const noexcept override;
+    const char* what() const noexcept override; ///< the text of the exception
 };
 
 /// "Texture is corrupted or doesn't exist!"
@@ -49,7 +50,7 @@ class NIB_EXPORT TextureNotValidException : public std::exception
 {
 public:
     ~TextureNotValidException() override;
-    const char* what() const noexcept override;
+    const char* what() const noexcept override; ///< the text of the exception
 };
 
 } // namespace Nib

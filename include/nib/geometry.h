@@ -70,9 +70,9 @@ public:
     /// @name One attribute, by its index within the buffer
     /// @throws InvalidArgumentException when @p i is not below the number of attributes
     /// @{
-    AttributeType attributeType(int i) const;
-    int attributeSize(int i) const;   ///< number of components
-    int attributeOffset(int i) const; ///< bytes from the start of the vertex
+    AttributeType attributeType(int i) const; ///< what its components are
+    int attributeSize(int i) const;           ///< number of components
+    int attributeOffset(int i) const;         ///< bytes from the start of the vertex
     /// @}
 
     std::int32_t count = 0;                       ///< attributes in use

@@ -61,10 +61,10 @@ public:
     /// A rectangle as EGL takes it: pixels, the origin at the bottom left.
     struct DamageRect
     {
-        EGLint x;
-        EGLint y;
-        EGLint width;
-        EGLint height;
+        EGLint x;      ///< of the left edge
+        EGLint y;      ///< of the lower edge
+        EGLint width;  ///< of the rectangle
+        EGLint height; ///< of the rectangle
     };
 
     UpdateRectangle(); ///< Reads the rotation of the panel from "ro.sf.hwrotation".
@@ -79,9 +79,13 @@ public:
     void Init(EglSurface* surface, int width, int height);
 
     // The steps of Init.
+    /// Resolves the entry points that the display names.
     void InitEGLExtensions();
+    /// Decides the update mode.
     void SetUpdateMode();
+    /// Makes the record of dirty rectangles that the mode needs.
     void InitClipRect();
+    /// Sets the size of the surface, in pixels.
     void SetScreenRect(int width, int height);
     bool SetPreserveBehavior(); ///< whether the surface now keeps its content across swaps
 

@@ -79,30 +79,36 @@ enum class StencilOperation : int
 /// minus source alpha, for colour and alpha alike.
 struct NIB_EXPORT BlendStateDescriptor
 {
-    explicit BlendStateDescriptor(bool enabled); ///< all colour channels are written
-    BlendStateDescriptor(bool enabled, bool colorWrite);
+    explicit BlendStateDescriptor(bool enabled);         ///< all colour channels are written
+    BlendStateDescriptor(bool enabled, bool colorWrite); ///< with the default modes
 
+    /// Switches blending, and the writing of all four channels.
     void SetEnabled(bool blending, bool writeColor);
+    /// How colour is blended: function(source * src, destination * dst).
     void SetColorBlendingMode(BlendingFunction function, BlendingFactor src, BlendingFactor dst);
+    /// How alpha is blended, likewise.
     void SetAlphaBlendingMode(BlendingFunction function, BlendingFactor src, BlendingFactor dst);
 
-    bool enabled;    ///< blending is on
-    bool colorWrite; ///< all four channels are written, or none
-    BlendingFunction colorFunction;
-    BlendingFunction alphaFunction;
-    BlendingFactor colorSrcFactor;
-    BlendingFactor colorDstFactor;
-    BlendingFactor alphaSrcFactor;
-    BlendingFactor alphaDstFactor;
+    bool enabled;                   ///< blending is on
+    bool colorWrite;                ///< all four channels are written, or none
+    BlendingFunction colorFunction; ///< how source and destination colour combine
+    BlendingFunction alphaFunction; ///< how source and destination alpha combine
+    BlendingFactor colorSrcFactor;  ///< what the source colour is multiplied by
+    BlendingFactor colorDstFactor;  ///< what the destination colour is multiplied by
+    BlendingFactor alphaSrcFactor;  ///< what the source alpha is multiplied by
+    BlendingFactor alphaDstFactor;  ///< what the destination alpha is multiplied by
 };
 
 /// A depth and stencil state as a value. By default depth passes when less and is written, stencil
 /// always passes and is kept, reference 0, all bits read and written.
 struct NIB_EXPORT DepthStencilStateDescriptor
 {
-    DepthStencilStateDescriptor(bool depthEnabled, bool stencilEnabled);
+    DepthStencilStateDescriptor(bool depthEnabled,
+                                bool stencilEnabled); ///< with the defaults above
 
+    /// The depth test, and whether the depth of what passes is stored.
     void SetDepthFunction(DepthStencilFunction function, bool writeDepth);
+    /// The stencil test: what @p readMask leaves of @p ref and of the stored value is compared.
     void SetStencilFunction(DepthStencilFunction function, unsigned char ref,
                             unsigned char readMask, unsigned char writeMask);
 
@@ -110,25 +116,29 @@ struct NIB_EXPORT DepthStencilStateDescriptor
     /// @p dppass: both pass.
     void SetStencilOperation(StencilOperation sfail, StencilOperation dpfail,
                              StencilOperation dppass);
+    /// As SetStencilOperation, for front faces.
     void SetStencilOperationFront(StencilOperation sfail, StencilOperation dpfail,
                                   StencilOperation dppass);
+    /// As SetStencilOperation, for back faces.
     void SetStencilOperationBack(StencilOperation sfail, StencilOperation dpfail,
                                  StencilOperation dppass);
 
-    bool depthEnabled;
-    bool stencilEnabled;
-    DepthStencilFunction depthFunction;
-    DepthStencilFunction stencilFunction;
-    StencilOperation frontStencilFail;
-    StencilOperation frontDepthFail;
-    StencilOperation frontPass;
-    StencilOperation backStencilFail;
-    StencilOperation backDepthFail;
-    StencilOperation backPass;
-    std::uint8_t stencilRef;
-    std::uint8_t stencilReadMask;
-    std::uint8_t stencilWriteMask;
-    bool depthWrite;
+    bool depthEnabled;   ///< the depth test is on
+    bool stencilEnabled; ///< the stencil test is on
+    DepthStencilFunction
+        depthFunction; ///< passes when it holds of the new depth and the stored one
+    DepthStencilFunction
+        stencilFunction;               ///< passes when it holds of stencilRef and the stored value
+    StencilOperation frontStencilFail; ///< front faces: the stencil test fails
+    StencilOperation frontDepthFail;   ///< front faces: it passes, the depth test fails
+    StencilOperation frontPass;        ///< front faces: both pass
+    StencilOperation backStencilFail;  ///< back faces: the stencil test fails
+    StencilOperation backDepthFail;    ///< back faces: it passes, the depth test fails
+    StencilOperation backPass;         ///< back faces: both pass
+    std::uint8_t stencilRef;           ///< the reference value
+    std::uint8_t stencilReadMask;      ///< the bits that are compared
+    std::uint8_t stencilWriteMask;     ///< the bits that are written
+    bool depthWrite;                   ///< the depth of what passes is stored
 };
 
 /// A blend state that can be made current. Holds no GL name and serves every context.
@@ -165,16 +175,20 @@ public:
     /// Pixels, from the lower left corner of the framebuffer.
     struct ScissorRect
     {
-        std::int32_t x = 0;
-        std::int32_t y = 0;
-        std::int32_t width = 0;
-        std::int32_t height = 0;
+        std::int32_t x = 0;      ///< of the left edge
+        std::int32_t y = 0;      ///< of the lower edge
+        std::int32_t width = 0;  ///< none or more
+        std::int32_t height = 0; ///< none or more
     };
 
     virtual ~IRasterizerState() = default;
+    /// Switches the scissor test.
     virtual void SetScissorEnabled(bool enabled) = 0;
+    /// Sets the rectangle; it holds while the test is on.
     virtual void SetScissorRect(const ScissorRect& rect) = 0;
+    /// Whether the scissor test is on, asked of GL.
     virtual bool IsScissorEnabled() const = 0;
+    /// The rectangle, asked of GL.
     virtual ScissorRect GetScissorRect() const = 0;
 };
 
@@ -237,6 +251,7 @@ public:
 class NIB_EXPORT IContextHolder
 {
 public:
+    /// Makers of GPUs that are told apart.
     enum GPUVendor : int
     {
         Unknown = 0, ///< no context was current when asked

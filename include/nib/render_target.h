@@ -21,9 +21,9 @@ class NIB_EXPORT IDepthStencilBuffer
 {
 public:
     virtual ~IDepthStencilBuffer() = default;
-    virtual unsigned int GetWidth() const = 0;
-    virtual unsigned int GetHeight() const = 0;
-    virtual void Release() = 0; ///< deletes the object and its GL storage
+    virtual unsigned int GetWidth() const = 0;  ///< in pixels
+    virtual unsigned int GetHeight() const = 0; ///< in pixels
+    virtual void Release() = 0;                 ///< deletes the object and its GL storage
 };
 
 /// A framebuffer: the window's, whatever was bound when the target was made, or an offscreen one.

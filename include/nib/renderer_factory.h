@@ -46,8 +46,10 @@ public:
                                                  const VertexDescriptor* descriptors,
                                                  unsigned int vertexCount, unsigned int indexCount);
 
+    /// A depth and stencil buffer, in pixels.
     static IDepthStencilBuffer* CreateDepthStencilBuffer(unsigned int width, unsigned int height);
 
+    /// A blend state with a copy of @p descriptor.
     static IBlendStateObject* CreateBlendStateObject(const BlendStateDescriptor& descriptor);
 
     /// A target that draws into @p color, which is borrowed and must outlive it. Throws
@@ -65,6 +67,7 @@ public:
     /// link.
     static IShaderProgram* CreateShaderProgram(const char* vs, const char* fs, const char* third);
 
+    /// A depth and stencil state with a copy of @p descriptor.
     static IDepthStencilState*
     CreateDepthStencilState(const DepthStencilStateDescriptor& descriptor);
 
@@ -72,14 +75,19 @@ public:
 
     static IUniformBuffer* CreateUniformBuffer(); ///< empty
 
+    /// The one scissor state; not given away.
     static IRasterizerState* GetRasterizerState();
+    /// The one view of the device; not given away.
     static IRendererDeviceCaps* GetRendererDeviceCaps();
+    /// The one view of the GPU's maker; not given away.
     static IContextHolder* GetContextHolder();
 
     // Render threads: not started. Names and callbacks are kept as pointers and must outlive them.
 
+    /// As GLES::CreateSurfaceRenderer.
     static RenderThreadGL* CreateSurfaceRenderer(const char* name,
                                                  RenderThreadGL::RenderPriority priority);
+    /// As GLES::CreateHWUIRenderer.
     static RenderThreadHWUI* CreateHWUIRenderer(HwuiCallback* callback, const char* name);
 
     /// Draws into the front buffer; shares its context with the render thread of @p parent, which

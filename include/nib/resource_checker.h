@@ -28,6 +28,7 @@ class IGLMsgQueue;
 class NIB_EXPORT ResourceChecker
 {
 public:
+    /// A kind of GL name.
     enum class DescriptorType : int
     {
         Texture = 0,
@@ -46,7 +47,7 @@ public:
     /// The details of a texture; -1 in any field means unknown.
     struct NIB_EXPORT TextureInfo : BaseInfo
     {
-        TextureInfo(int width, int height, unsigned internalFormat);
+        TextureInfo(int width, int height, unsigned internalFormat); ///< the fields, in order
         ~TextureInfo() override;
 
         int width;               ///< pixels
@@ -57,6 +58,7 @@ public:
     /// One GL name that is alive.
     struct NIB_EXPORT CheckerItem
     {
+        /// A name without a tag or details.
         CheckerItem(unsigned int id, IGLMsgQueue* queue, void* context);
 
         /// Takes @p other's details away from it: they have one owner.
@@ -71,14 +73,15 @@ public:
         /// The queue's tag, or an empty text. The pointer is kept, not the text, which must outlive
         /// the item.
         const char* queueName;
-        void* context; ///< the EGL context that owns the name
-        unsigned int id;
+        void* context;   ///< the EGL context that owns the name
+        unsigned int id; ///< the GL name
 
         // Not part of the order: they may change, and move on, while the item stands in a database.
-        mutable std::string tag;
+        mutable std::string tag;                ///< what updateTagLookup said of it
         mutable std::unique_ptr<BaseInfo> info; ///< may be null
     };
 
+    /// The live names of one kind.
     using Database = std::set<CheckerItem>;
 
     /// Names a database; handed over by value.
@@ -87,8 +90,8 @@ public:
         /// The name of the database, empty for a type that is none of the five.
         const char* toString() const;
 
-        Database* db;
-        DescriptorType type;
+        Database* db;        ///< where the names of the kind are kept
+        DescriptorType type; ///< the kind
     };
 
     /// Records a name that was created. @p info may be null.
@@ -110,6 +113,7 @@ public:
     /// Says that the objects of the context @p shared belong to @p owner. The first call for a
     /// context counts; a null owner is ignored.
     static void addSharedContext(void* shared, void* owner);
+    /// Forgets what addSharedContext said of a context.
     static void removeSharedContext(void* shared);
 
     /// Logs the texture memory of every queue and each name that the calling thread's queue and
@@ -121,7 +125,9 @@ public:
 
     /// The context under which the calling thread's names of a kind are recorded.
     static void* getRealContext(DescriptorType type);
+    /// Logs the names of one kind that the calling thread's queue and context still have.
     static void lookForContextResources(dbDescriptor db, bool isError);
+    /// Logs the texture memory of every queue.
     static void printInfoTexture();
 
     /// Writes the items to standard output, a line each. To be called by hand.
@@ -132,22 +138,22 @@ public:
 
     // ---- the databases ----
 
-    static Database textureDb;
-    static Database samplerDb;
-    static Database frameBufferDb;
-    static Database renderBufferDb;
-    static Database vertexBufferDb;
+    static Database textureDb;               ///< live textures
+    static Database samplerDb;               ///< live samplers
+    static Database frameBufferDb;           ///< live framebuffers
+    static Database renderBufferDb;          ///< live renderbuffers
+    static Database vertexBufferDb;          ///< live buffers
     static std::map<void*, void*> contextDb; ///< from a context to the one it shares with
 
-    static const dbDescriptor textureDbDescriptor;
-    static const dbDescriptor samplerDbDescriptor;
-    static const dbDescriptor frameBufferDbDescriptor;
-    static const dbDescriptor renderBufferDbDescriptor;
-    static const dbDescriptor vertexBufferDbDescriptor;
+    static const dbDescriptor textureDbDescriptor;      ///< of textureDb
+    static const dbDescriptor samplerDbDescriptor;      ///< of samplerDb
+    static const dbDescriptor frameBufferDbDescriptor;  ///< of frameBufferDb
+    static const dbDescriptor renderBufferDbDescriptor; ///< of renderBufferDb
+    static const dbDescriptor vertexBufferDbDescriptor; ///< of vertexBufferDb
 
-    static constexpr unsigned char ALL_INFO = 0;
-    static constexpr unsigned BIT_TO_KB = 8192; ///< bits a KB
-    static constexpr unsigned KB_TO_MB = 1024;  ///< KB a MB
+    static constexpr unsigned char ALL_INFO = 0; ///< everything is told
+    static constexpr unsigned BIT_TO_KB = 8192;  ///< bits a KB
+    static constexpr unsigned KB_TO_MB = 1024;   ///< KB a MB
 };
 
 } // namespace Nib

@@ -40,7 +40,7 @@ enum class BindingType : int32_t
 class NIB_EXPORT IParameterBinding
 {
 public:
-    explicit IParameterBinding(BindingType type);
+    explicit IParameterBinding(BindingType type); ///< kept for GetType
     IParameterBinding(const IParameterBinding&) = delete;
     IParameterBinding& operator=(const IParameterBinding&) = delete;
 
@@ -50,21 +50,22 @@ public:
     virtual void Release() = 0; ///< deletes the binding
     virtual ~IParameterBinding();
 
-    const BindingType& GetType() const { return m_type; }
+    const BindingType& GetType() const { return m_type; } ///< what the binding was made as
 
     /// The address of the value last set: zero at first, the identity for a Matrix4. Valid as long
     /// as the binding. Throws for an Undefined binding, although setting one is ignored.
     const void* GetValue() const;
 
 protected:
-    const BindingType m_type;
+    const BindingType m_type;      ///< what the binding was made as
     unsigned char m_boolValue = 0; ///< the byte as it was given: GL takes any but 0 for true
     int32_t m_intValue = 0;        ///< of Int, Sampler and UniformBlock
-    float m_floatValue = 0.0f;
-    float m_vector2Value[2] = {};
-    float m_vector3Value[3] = {};
-    float m_vector4Value[4] = {};
-    float m_matrixValue[16] = {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1};
+    float m_floatValue = 0.0f;     ///< of a float
+    float m_vector2Value[2] = {};  ///< of a vector
+    float m_vector3Value[3] = {};  ///< of a vector
+    float m_vector4Value[4] = {};  ///< of a vector
+    float m_matrixValue[16] = {1, 0, 0, 0, 0, 1, 0, 0,
+                               0, 0, 1, 0, 0, 0, 0, 1}; ///< of a matrix, column after column
 };
 
 /// One GL program, made from a vertex and a fragment source by

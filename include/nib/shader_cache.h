@@ -35,13 +35,13 @@ public:
     struct NIB_EXPORT BinaryShader
     {
         BinaryShader() = default;
-        BinaryShader(BinaryShader&& other) noexcept;
-        BinaryShader& operator=(BinaryShader&& other) noexcept;
+        BinaryShader(BinaryShader&& other) noexcept;            ///< takes the bytes over
+        BinaryShader& operator=(BinaryShader&& other) noexcept; ///< takes the bytes over
         ~BinaryShader();
 
         BinaryShader* Clone() const; ///< a new record with its own copy of everything
 
-        BinaryShaderKey key = 0;
+        BinaryShaderKey key = 0;             ///< under which it is kept
         int32_t length = 0;                  ///< of the binary, in bytes
         uint32_t format = 0;                 ///< as glGetProgramBinary gave it
         unsigned char* bytes = nullptr;      ///< `length` bytes from new[], owned

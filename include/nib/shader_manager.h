@@ -39,17 +39,18 @@ public:
         /// By name, byte for byte, then by the context's address.
         bool operator<(const Key& other) const;
 
-        std::string name;
-        void* context; ///< as IContextHolder::GetCurrentContextId gives it
+        std::string name; ///< of the program
+        void* context;    ///< as IContextHolder::GetCurrentContextId gives it
     };
 
     /// What is registered under a key; the registry never looks inside.
     struct Entry
     {
         void* program = nullptr; ///< not owned
-        uint32_t useCount = 0;
+        uint32_t useCount = 0;   ///< of its users
     };
 
+    /// The one registry; made by the first call.
     static ShaderManager* GetInstance();
 
     ShaderManager(const ShaderManager&) = delete;
@@ -67,6 +68,7 @@ public:
     /// Whether @p key is registered; if so and @p out is not null, copies its entry there.
     bool Find(const Key& key, Entry* out);
     bool Remove(const Key& key); ///< false: there was no such entry
+    /// The number of entries.
     size_t Size();
 
 private:

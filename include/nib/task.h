@@ -60,6 +60,7 @@ template <typename T, typename F>
 class Member0 : public ITask
 {
 public:
+    /// A call of @p function on @p object, which must outlive the task.
     Member0(T* object, F function) : m_object(object), m_function(function) {}
 
     void run() override { static_cast<void>((m_object->*m_function)()); }
@@ -74,6 +75,7 @@ template <typename T, typename F, typename A1, typename A2>
 class Member2 : public ITask
 {
 public:
+    /// As above, with copies of the arguments.
     Member2(T* object, F function, A1 a1, A2 a2)
         : m_object(object), m_function(function), m_a1(std::move(a1)), m_a2(std::move(a2))
     {
@@ -93,6 +95,7 @@ template <typename T, typename F, typename A1, typename A2, typename A3>
 class Member3 : public ITask
 {
 public:
+    /// As above, with copies of the arguments.
     Member3(T* object, F function, A1 a1, A2 a2, A3 a3)
         : m_object(object), m_function(function), m_a1(std::move(a1)), m_a2(std::move(a2)),
           m_a3(std::move(a3))
@@ -114,6 +117,7 @@ template <typename F>
 class Func0 : public ITask
 {
 public:
+    /// A call of @p function.
     explicit Func0(F function) : m_function(function) {}
 
     void run() override { static_cast<void>(m_function()); }
@@ -127,6 +131,7 @@ template <typename F, typename A1>
 class Func1 : public ITask
 {
 public:
+    /// As above, with a copy of the argument.
     Func1(F function, A1 a1) : m_function(function), m_a1(std::move(a1)) {}
 
     void run() override { static_cast<void>(m_function(m_a1)); }
@@ -142,6 +147,7 @@ template <typename F, typename A1, typename A2>
 class Func2 : public ITask
 {
 public:
+    /// As above, with copies of the arguments.
     Func2(F function, A1 a1, A2 a2) : m_function(function), m_a1(std::move(a1)), m_a2(std::move(a2))
     {
     }

@@ -103,9 +103,9 @@ struct NIB_EXPORT TextureDescriptor
     std::int32_t width = 0;  ///< pixels
     std::int32_t height = 0; ///< pixels
     std::int32_t depth = 0;  ///< layers of an array, depth of a 3D texture
-    TextureTargetLayout layout = TextureTargetLayout::Rgba;
-    TextureMemoryLayout memoryLayout = TextureMemoryLayout::RGBA8;
-    std::int32_t target = kTextureTarget2D; ///< a TextureTarget
+    TextureTargetLayout layout = TextureTargetLayout::Rgba;        ///< what a texel is made of
+    TextureMemoryLayout memoryLayout = TextureMemoryLayout::RGBA8; ///< how it is stored
+    std::int32_t target = kTextureTarget2D;                        ///< a TextureTarget
     /// Fences the upload, so that the first Activate, on whatever context, waits for it.
     bool syncOnCreate = false;
     /// When set, the texture is a second handle onto the GL names of this one. Not owned.
@@ -116,9 +116,9 @@ struct NIB_EXPORT TextureDescriptor
 /// rows; a rowLength of 0 is the texture's width.
 struct TextureBufferInfo
 {
-    std::int32_t skipPixels = 0;
-    std::int32_t skipRows = 0;
-    std::int32_t rowLength = 0;
+    std::int32_t skipPixels = 0; ///< texels left out at the start of each row
+    std::int32_t skipRows = 0;   ///< rows left out at the start
+    std::int32_t rowLength = 0;  ///< texels a row of the source; 0: the width
 };
 
 /// A GL texture with its sampling parameters, or an alias of one.
@@ -162,6 +162,7 @@ public:
     /// @throws TextureNotValidException when width and height are both 0
     virtual void SetData(const void* pixels, int rowLength) = 0;
 
+    /// What the texture was made from.
     virtual const TextureDescriptor& GetDescriptor() const = 0;
 
     /// Sets a sampling parameter; kept over a context loss. @p index is a TextureParam, @p value a
