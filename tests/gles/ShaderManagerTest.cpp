@@ -186,6 +186,20 @@ TEST_F(ShaderManagerTest, WithoutADestroyedContextARestoreIsOneLine)
     EXPECT_TRUE(manager->Remove("brush"));
 }
 
+TEST_F(ShaderManagerTest, WithoutADestroyedContextShadersOfNoContextStay)
+{
+    gl.context.Release();
+    Register("early");
+    gl.context.MakeCurrent();
+
+    manager->OnRestoreContext();
+
+    EXPECT_FALSE(IsRegistered("early")); // here; it still belongs to no context
+    gl.context.Release();
+    EXPECT_TRUE(manager->Remove("early"));
+    gl.context.MakeCurrent();
+}
+
 TEST_F(ShaderManagerTest, ShadersOfADeadContextMoveToTheNewOne)
 {
     manager->Add("pen", EntryOf(&program, 5));
