@@ -70,6 +70,13 @@ void InkSession::AttachWindow(void* window)
     Invalidate();
 }
 
+void InkSession::DetachWindow()
+{
+    m_window = nullptr;
+    PostGuarded([](GlState& gl) { gl.view.reset(); });
+    m_thread.OnSurfaceDestroyed();
+}
+
 void InkSession::AttachScreen()
 {
     PostGuarded(
@@ -130,7 +137,7 @@ void InkSession::Present()
     m_tasks += 2; // the thread's own, before the view and behind it
 }
 
-void InkSession::LoseContext()
+void InkSession::Pause()
 {
     PostGuarded(
         [](GlState& gl)
@@ -141,7 +148,10 @@ void InkSession::LoseContext()
                 gl.view->Suspend();
         });
     m_thread.OnPause(); // behind the task above; the objects let go of their GL names
+}
 
+void InkSession::Resume()
+{
     m_thread.OnResume(); // the objects get new names, their contents are ours to bring
     PostGuarded(
         [](GlState& gl)
@@ -152,6 +162,12 @@ void InkSession::LoseContext()
                 gl.view->Resume();
         });
     Wait(); // OnResume itself does not wait for the context
+}
+
+void InkSession::LoseContext()
+{
+    Pause();
+    Resume();
 }
 
 std::vector<std::uint8_t> InkSession::ReadPixels()

@@ -39,6 +39,9 @@ public:
     /// Shows the page in @p window, which has the page's size. [blocks]
     void AttachWindow(void* window);
 
+    /// The window goes; the page stays. [blocks]
+    void DetachWindow();
+
     /// Without a window, frames go to an offscreen screen of the page's size. Never blocks.
     void AttachScreen();
 
@@ -57,9 +60,15 @@ public:
     /// Shows what changed since the last frame. [blocks] until the frame is presented.
     void Present();
 
-    /// Has the render thread lose its context and get a new one, as an application does that goes
-    /// into the background: everything on the page is kept. Only on threads that can be paused
-    /// (offscreen ones with a parent). [blocks]
+    /// Has the render thread give up its context, as an application does that goes into the
+    /// background: everything on the page is kept. Only on threads that can be paused: those with
+    /// a parent, offscreen and front-buffer ones. Until Resume nothing is drawn. [blocks]
+    void Pause();
+
+    /// Has it go on where Pause found it, with a new context. [blocks]
+    void Resume();
+
+    /// Pause and Resume in one. [blocks]
     void LoseContext();
 
     /// The page as it is now: RGBA, premultiplied, top row first. [blocks]
