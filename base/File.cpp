@@ -37,7 +37,7 @@ int OpenFlags(const char* mode)
     if (std::strchr(mode, 'x'))
         flags |= O_EXCL;
     if (std::strchr(mode, 'n'))
-        flags |= O_NOFOLLOW;
+        flags |= O_NOFOLLOW | O_NONBLOCK; // the latter for a pipe, whose other end may never come
     return flags;
 }
 

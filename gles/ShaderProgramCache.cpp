@@ -1,6 +1,7 @@
 #include "base/Log.h"
 #include "gles/BinaryShaderFile.h"
 #include "gles/BinaryShaderReader.h"
+#include "gles/SymbolicLink.h"
 #include "gles/TemporaryFiles.h"
 
 #include <nib/shader_cache.h>
@@ -201,7 +202,7 @@ bool ShaderProgramCache::SetBinaryShader(const BinaryShader& shader)
     if (replaces)
     {
         NIB_LOG_WARN("%s - Binary shader already in cache. Replace with new version", function);
-        File::Unlink(GetFileName(key).c_str());
+        RemoveFile(key);
     }
     // Cloned before the old record goes: it may be the argument.
     const std::shared_ptr<const BinaryShader> clone(shader.Clone());
@@ -224,6 +225,25 @@ std::string ShaderProgramCache::GetFileName(BinaryShaderKey key) const
     return m_cacheDirectory + name;
 }
 
+/// False, with an errno, without a folder, where names would be the root's, and when somebody has
+/// put a link in its place, where they would be in a folder of his choice.
+bool ShaderProgramCache::HasOwnFolder() const
+{
+    if (m_cacheDirectory.empty())
+        errno = ENOENT;
+    else if (IsSymbolicLink(m_cacheDirectory.c_str()))
+        errno = ELOOP;
+    else
+        return true;
+    return false;
+}
+
+void ShaderProgramCache::RemoveFile(BinaryShaderKey key) const
+{
+    if (HasOwnFolder())
+        File::Unlink(GetFileName(key).c_str());
+}
+
 bool ShaderProgramCache::SaveToFile(const BinaryShader* shader)
 {
     NIB_FUNCTION("bool Nib::ShaderProgramCache::SaveToFile(const "
@@ -231,8 +251,7 @@ bool ShaderProgramCache::SaveToFile(const BinaryShader* shader)
     const std::string path = GetFileName(shader->key);
     String temporary; // so that no reader sees half a file
     File file;
-    errno = ENOENT; // without a folder nothing is tried: the name would be one of the root's
-    if (m_cacheDirectory.empty() || !OpenTemporary(file, path, temporary))
+    if (!HasOwnFolder() || !OpenTemporary(file, path, temporary))
     {
         NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
                       path.c_str());
@@ -244,7 +263,7 @@ bool ShaderProgramCache::SaveToFile(const BinaryShader* shader)
     {
         NIB_LOG_ERROR("%s filed to save file %s", function, path.c_str());
         File::Unlink(&temporary);
-        File::Unlink(path.c_str()); // what stands there is out of date
+        RemoveFile(shader->key); // what stands there is out of date
         return false;
     }
     if (std::rename(temporary.Get(), path.c_str()) != 0)
@@ -266,7 +285,7 @@ ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderK
     String filePath;
     filePath.Construct(path);
     File file;
-    if (!file.Construct(&filePath, "rbn", false))
+    if (!HasOwnFolder() || !file.Construct(&filePath, "rbn", false))
     {
         NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
                       path);

@@ -1,5 +1,7 @@
 #include "gles/TemporaryFiles.h"
 
+#include "gles/SymbolicLink.h"
+
 #include <atomic>
 #include <cerrno>
 #include <charconv>
@@ -81,7 +83,7 @@ std::string TemporaryName(const std::string& path)
 void RemoveStaleTemporaries(const std::string& directory)
 {
     const std::unique_ptr<DIR, CloseFolder> folder(opendir(directory.c_str()));
-    if (!folder)
+    if (!folder || IsSymbolicLink(directory.c_str()))
         return;
     while (const dirent* const entry = readdir(folder.get()))
     {

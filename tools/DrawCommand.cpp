@@ -1,19 +1,17 @@
 #include "DrawCommand.h"
 
-#include "Drawing.h"
-#include "DrawOptions.h"
-#include "LiveDrawing.h"
 #include "UserError.h"
 
 #include <memory>
+#include <utility>
 
 namespace
 {
 
-void Run(const DrawOptions& options)
+void Check(const DrawOptions& options)
 {
     if (options.live)
-        return LiveDrawing(options).Run();
+        return;
     if (options.files.empty())
         throw UserError("draw: FILE is required, unless --live opens an empty page");
     if (options.output.empty() && !options.window)
@@ -22,12 +20,11 @@ void Run(const DrawOptions& options)
         throw UserError("--export: say where to: -o PAGE.png");
     if (options.frontBuffer && !options.window)
         throw UserError("--front-buffer: only a window has one; add --window or --live");
-    Drawing(options).Run();
 }
 
 } // namespace
 
-void AddDrawCommand(CLI::App& app)
+void AddDrawCommand(CLI::App& app, std::function<void(const DrawOptions&)> run)
 {
     CLI::App* const draw = app.add_subcommand("draw", "Draw recorded pen strokes");
     const auto options = std::make_shared<DrawOptions>();
@@ -74,5 +71,10 @@ void AddDrawCommand(CLI::App& app)
     for (const char* replay :
          {"--window", "--speed", "--keep", "--json", "--export", "--lose-context"})
         live->excludes(replay);
-    draw->callback([options] { Run(*options); });
+    draw->callback(
+        [options, run = std::move(run)]
+        {
+            Check(*options);
+            run(*options);
+        });
 }

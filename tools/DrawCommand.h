@@ -1,9 +1,14 @@
 #ifndef NIB_TOOLS_DRAW_COMMAND_H
 #define NIB_TOOLS_DRAW_COMMAND_H
 
+#include "DrawOptions.h"
+
 #include <CLI/CLI.hpp>
 
-/// Adds the subcommand `draw` to @p app; it runs when its options have been parsed.
-void AddDrawCommand(CLI::App& app);
+#include <functional>
+
+/// Adds the subcommand `draw` to @p app; @p run is called when its options have been parsed and fit
+/// together. Throws UserError from CLI::App::parse when they do not.
+void AddDrawCommand(CLI::App& app, std::function<void(const DrawOptions&)> run);
 
 #endif

@@ -1,5 +1,7 @@
 #include "DrawCommand.h"
+#include "Drawing.h"
 #include "InfoCommand.h"
+#include "LiveDrawing.h"
 #include "Recording.h"
 #include "UserError.h"
 
@@ -16,6 +18,14 @@ namespace
 
 constexpr int kUserErrorStatus = 2;
 
+void Draw(const DrawOptions& options)
+{
+    if (options.live)
+        LiveDrawing(options).Run();
+    else
+        Drawing(options).Run();
+}
+
 int Fail(const std::exception& failure)
 {
     std::fprintf(stderr, "nib: %s\n", failure.what());
@@ -31,7 +41,7 @@ int main(int argc, char** argv)
     CLI::App app("Draw with NibRenderer from the command line", "nib");
     app.set_version_flag("--version", std::string("nib ") + Nib::GetVersionString());
     app.require_subcommand(1);
-    AddDrawCommand(app);
+    AddDrawCommand(app, &Draw);
     AddInfoCommand(app);
     try
     {

@@ -277,7 +277,7 @@ public:
 
     /// Opens @p path as fopen() does for @p mode: "r", "w" or "a", with "+", "b", "x" or "e" behind
     /// it, and two letters of its own: "n" refuses (ELOOP) a path whose last part is a symbolic
-    /// link, "p" makes a new file for this user alone (0600). The file is never inherited by a
+    /// link and does not wait for the other end of a pipe, "p" makes a new file for this user alone (0600). The file is never inherited by a
     /// program that the process starts. A file that this object had open is closed. @p
     /// createParents makes the missing folders of the path first.
     bool Construct(const String* path, const char* mode, bool createParents);

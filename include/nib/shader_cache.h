@@ -93,6 +93,8 @@ private:
     BinaryShader* LoadFromFile(BinaryShaderKey key);
     bool SaveToFile(const BinaryShader* shader);
     std::string GetFileName(BinaryShaderKey key) const;
+    bool HasOwnFolder() const;
+    void RemoveFile(BinaryShaderKey key) const;
 
     static std::unique_ptr<ShaderProgramCache> m_instance;
     static std::atomic<ShaderProgramCache*> m_published; // m_instance, when it is ready for use

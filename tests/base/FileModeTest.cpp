@@ -111,6 +111,17 @@ TEST_F(FileMode, NOpensAnOrdinaryFile)
     EXPECT_EQ(Open(Path("file"), "wbxnp"), EEXIST);
 }
 
+TEST_F(FileMode, NDoesNotWaitForTheOtherEndOfAPipe)
+{
+    ASSERT_EQ(mkfifo(Path("pipe").c_str(), 0600), 0);
+    const String name(Path("pipe").c_str());
+    File file;
+    char byte = 0;
+
+    EXPECT_TRUE(file.Construct(&name, "rbn", false));
+    EXPECT_EQ(file.Read(&byte, 1, 1), 0u);
+}
+
 TEST_F(FileMode, OtherLettersAreRefused)
 {
     EXPECT_EQ(Open(Path("file"), "wq"), EINVAL);

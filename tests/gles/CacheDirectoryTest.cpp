@@ -111,6 +111,17 @@ TEST_F(CacheDirectory, ThatExistsIsTakenAsItIs)
     EXPECT_TRUE(cache->SetBinaryShader(Record(1, "P")));
 }
 
+TEST_F(CacheDirectory, IsNotMadeBehindALinkToNothing)
+{
+    System::SetSDKCacheDirectoryPath((folder / "sdk").c_str());
+    fs::create_symlink(folder / "elsewhere", folder / "RendererCache");
+    ShaderProgramCache::GetInstance();
+
+    EXPECT_FALSE(fs::exists(folder / "elsewhere"));
+    EXPECT_EQ(Errors(), (Texts{"bool Nib::ShaderProgramCache::Init() : Fail to make the shader "
+                               "cache directory. errno = 17"}));
+}
+
 TEST_F(CacheDirectory, ASecondInitOnlyWarns)
 {
     System::SetSDKCacheDirectoryPath((folder / "sdk").c_str());

@@ -334,6 +334,61 @@ TEST_F(ProgramCache, ALinkUnderATemporaryNameIsPassedOver)
     EXPECT_EQ(driver.Log().size(), 0u);
 }
 
+TEST_F(ProgramCache, APipeInPlaceOfAFileIsRefusedWithoutWaitingForItsOtherEnd)
+{
+    ASSERT_EQ(mkfifo(folder.File("sh5.dat").c_str(), 0600), 0);
+
+    EXPECT_EQ(cache->GetBinaryShader(5), nullptr);
+    EXPECT_EQ(Errors(),
+              (Texts{"ShaderProgramCache::BinaryShader *Nib::ShaderProgramCache::LoadFromFile("
+                     "ShaderProgramCache::BinaryShaderKey) File header read error Err=0, File = " +
+                     folder.File("sh5.dat")}));
+}
+
+TEST_F(ProgramCache, ALinkInPlaceOfTheFolderIsNotReadThrough)
+{
+    const TemporaryFolder elsewhere;
+    WriteBytes(elsewhere / "sh5.dat", FileFields().File());
+    fs::remove(folder.Path());
+    fs::create_symlink(elsewhere.Path(), folder.Path());
+
+    EXPECT_EQ(cache->GetBinaryShader(5), nullptr);
+    EXPECT_EQ(Errors(),
+              (Texts{"ShaderProgramCache::BinaryShader *Nib::ShaderProgramCache::LoadFromFile("
+                     "ShaderProgramCache::BinaryShaderKey) Failed to create shader binary file. "
+                     "Err=40. File=" +
+                     folder.File("sh5.dat")}));
+}
+
+TEST_F(ProgramCache, ALinkInPlaceOfTheFolderIsNotWrittenThrough)
+{
+    const TemporaryFolder elsewhere;
+    fs::remove(folder.Path());
+    fs::create_symlink(elsewhere.Path(), folder.Path());
+
+    EXPECT_FALSE(cache->SetBinaryShader(Record(5, "NEW")));
+    EXPECT_TRUE(fs::is_empty(elsewhere.Path()));
+    EXPECT_EQ(Errors(),
+              (Texts{"bool Nib::ShaderProgramCache::SaveToFile(const "
+                     "ShaderProgramCache::BinaryShader *) Failed to create shader binary file. "
+                     "Err=40. File=" +
+                         folder.File("sh5.dat"),
+                     "bool Nib::ShaderProgramCache::SetBinaryShader(const "
+                     "ShaderProgramCache::BinaryShader &) - Failed to save cloned binary shader"}));
+}
+
+TEST_F(ProgramCache, AReplacementRemovesNothingBehindALinkInPlaceOfTheFolder)
+{
+    const TemporaryFolder elsewhere;
+    WriteBytes(elsewhere / "sh5.dat", Bytes{'v'});
+    EXPECT_TRUE(cache->SetBinaryShader(Record(5, "OLD")));
+    fs::remove_all(folder.Path());
+    fs::create_symlink(elsewhere.Path(), folder.Path());
+
+    EXPECT_FALSE(cache->SetBinaryShader(Record(5, "NEW")));
+    EXPECT_EQ(ReadBytes(elsewhere / "sh5.dat"), Bytes{'v'});
+}
+
 // ---- attribute blocks ---------------------------------------------------------------------------
 
 namespace

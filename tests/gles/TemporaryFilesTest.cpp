@@ -99,6 +99,19 @@ TEST_F(TemporaryFiles, ALinkUnderTheirNameGoesAndNotWhatItPointsTo)
     EXPECT_EQ(ReadBytes(elsewhere / "victim"), Bytes{'v'});
 }
 
+TEST_F(TemporaryFiles, BehindALinkInPlaceOfTheFolderAreLeftAlone)
+{
+    const TemporaryFolder elsewhere;
+    const std::string stale = elsewhere / ("sh5.dat." + EndedProcess() + ".0.tmp");
+    WriteBytes(stale, Bytes{'v'});
+    fs::remove(cache.Path());
+    fs::create_symlink(elsewhere.Path(), cache.Path());
+
+    ShaderProgramCache::GetInstance();
+
+    EXPECT_TRUE(fs::exists(stale));
+}
+
 TEST_F(TemporaryFiles, NoTwoNamesAreAlike)
 {
     EXPECT_NE(Nib::TemporaryName("/c/sh5.dat"), Nib::TemporaryName("/c/sh5.dat"));
