@@ -62,13 +62,14 @@ std::string Summary(const Figures& figures)
 std::string ToJson(const Figures& figures)
 {
     const nlohmann::ordered_json object = {
+        {"schema", 1},
         {"strokes", figures.strokes},
         {"samples", figures.samples},
         {"frames", figures.frames},
         {"tasks", figures.tasks},
         {"seconds", Rounded(figures.seconds)},
-        {"redrawn_share", Rounded(figures.redrawn)},
-        {"frame_ms", FrameTimes(figures.frameTimes)},
+        {"redrawnShare", Rounded(figures.redrawn)},
+        {"frameMilliseconds", FrameTimes(figures.frameTimes)},
         {"programs",
          {{"compiled", figures.programs.compiled}, {"loaded", figures.programs.loaded}}},
     };

@@ -69,16 +69,16 @@ TEST(Figures, LineWithoutFramesLeavesThemOut)
 TEST(Figures, JsonHoldsThemAll)
 {
     EXPECT_EQ(Json::parse(ToJson(WithFrames())), Json::parse(R"({
-        "strokes": 3, "samples": 400, "frames": 400, "tasks": 1601, "seconds": 1.5,
-        "redrawn_share": 0.0123, "frame_ms": {"p50": 200.0, "p95": 380.0, "p99": 396.0},
+        "schema": 1, "strokes": 3, "samples": 400, "frames": 400, "tasks": 1601, "seconds": 1.5,
+        "redrawnShare": 0.0123, "frameMilliseconds": {"p50": 200.0, "p95": 380.0, "p99": 396.0},
         "programs": {"compiled": 2, "loaded": 5}})"));
 }
 
 TEST(Figures, JsonWithoutFramesHasNull)
 {
     const Json figures = Json::parse(ToJson(WithoutFrames()));
-    EXPECT_TRUE(figures.at("redrawn_share").is_null());
-    EXPECT_TRUE(figures.at("frame_ms").is_null());
+    EXPECT_TRUE(figures.at("redrawnShare").is_null());
+    EXPECT_TRUE(figures.at("frameMilliseconds").is_null());
     EXPECT_EQ(figures.at("frames"), 0);
 }
 
@@ -90,7 +90,7 @@ TEST(Figures, JsonIsOneLineOfShortNumbers)
     const std::string text = ToJson(figures);
     EXPECT_EQ(text.find('\n'), std::string::npos);
     EXPECT_NE(text.find("\"p50\":0.1,"), std::string::npos) << text;
-    EXPECT_NE(text.find("\"redrawn_share\":0.333333,"), std::string::npos) << text;
+    EXPECT_NE(text.find("\"redrawnShare\":0.333333,"), std::string::npos) << text;
 }
 
 } // namespace
