@@ -13,6 +13,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <memory>
+#include <stdexcept>
 #include <string>
 
 /// Ends objects of the renderer factory.
@@ -28,43 +29,64 @@ struct FactoryRelease
 template <typename T>
 using Owned = std::unique_ptr<T, FactoryRelease>;
 
-/// Runs all benchmarks of the program on a render thread, with a cache folder of its own and
-/// without log output; without DISPLAY on the surfaceless platform. The program's exit status.
+/// What every benchmark program runs in: a cache folder of its own, which goes with this object, no
+/// log output, and without DISPLAY the surfaceless platform.
+class BenchEnvironment
+{
+public:
+    BenchEnvironment(int argc, char** argv)
+        : m_folder((std::filesystem::temp_directory_path() / "nib-bench-XXXXXX").string())
+    {
+        if (!mkdtemp(m_folder.data()))
+            throw std::runtime_error("no temporary folder");
+        m_cache = m_folder + "/sdk";
+        Nib::System::SetSDKCacheDirectoryPath(m_cache.c_str());
+        setenv("MESA_SHADER_CACHE_DIR", (m_folder + "/driver").c_str(), 1);
+        setenv("NIB_LOG", "silent", 0);
+        if (!std::getenv("DISPLAY"))
+            setenv("EGL_PLATFORM", "surfaceless", 0);
+        benchmark::Initialize(&argc, argv);
+    }
+    ~BenchEnvironment()
+    {
+        std::error_code ignored;
+        std::filesystem::remove_all(m_folder, ignored);
+    }
+    BenchEnvironment(const BenchEnvironment&) = delete;
+    BenchEnvironment& operator=(const BenchEnvironment&) = delete;
+
+private:
+    std::string m_folder;
+    std::string m_cache;
+};
+
+/// A render thread that runs, or null after a line on standard error.
+inline std::unique_ptr<Nib::RenderThreadGL> StartedBenchThread()
+{
+    std::unique_ptr<Nib::RenderThreadGL> thread(
+        Nib::GLES::CreateSurfaceRenderer("bench", Nib::RenderThreadGL::Medium));
+    if (thread->Start())
+        return thread;
+    std::fprintf(stderr, "the driver does not start\n");
+    return nullptr;
+}
+
+/// Runs all benchmarks of the program on a render thread. The program's exit status.
 inline int RunBenchmarksOnRenderThread(int argc, char** argv)
 {
-    namespace fs = std::filesystem;
-
     class BenchmarkTask : public Nib::ITask
     {
     public:
         void run() override { benchmark::RunSpecifiedBenchmarks(); }
     };
 
-    std::string folder = (fs::temp_directory_path() / "nib-bench-XXXXXX").string();
-    if (!mkdtemp(folder.data()))
+    const BenchEnvironment environment(argc, argv);
+    const std::unique_ptr<Nib::RenderThreadGL> thread = StartedBenchThread();
+    if (!thread)
         return 1;
-    Nib::System::SetSDKCacheDirectoryPath((folder + "/sdk").c_str());
-    setenv("MESA_SHADER_CACHE_DIR", (folder + "/driver").c_str(), 1);
-    setenv("NIB_LOG", "silent", 0);
-    if (!std::getenv("DISPLAY"))
-        setenv("EGL_PLATFORM", "surfaceless", 0);
-    benchmark::Initialize(&argc, argv);
-
-    std::unique_ptr<Nib::RenderThreadGL> thread(
-        Nib::GLES::CreateSurfaceRenderer("bench", Nib::RenderThreadGL::Medium));
-    const bool started = thread->Start();
-    if (started)
-    {
-        thread->GetMsgQueue()->enQueueMsg(new BenchmarkTask);
-        thread->GetMsgQueue()->waitForCompleting();
-    }
-    else
-    {
-        std::fprintf(stderr, "the driver does not start\n");
-    }
-    thread.reset();
-    fs::remove_all(folder);
-    return started ? 0 : 1;
+    thread->GetMsgQueue()->enQueueMsg(new BenchmarkTask);
+    thread->GetMsgQueue()->waitForCompleting();
+    return 0;
 }
 
 #endif
