@@ -51,8 +51,8 @@ private:
 /// by frame. A surface render thread owns one.
 ///
 /// Threads  constructed anywhere; everything else on the render thread, with its context current.
-/// Order    Init for each new or resized surface; then for each frame UseRect (any number of
-///          times), drawing, Reset, DoSwapBuffers.
+/// Order    Init for each new or resized surface; then for each frame UseRect (best once: see
+///          docs/partial-update.md), drawing, Reset, DoSwapBuffers.
 /// Failure  a technique that the device lacks is not chosen; the last resort redraws everything.
 ///          Nothing throws.
 class NIB_EXPORT UpdateRectangle

@@ -82,8 +82,8 @@ public:
     /// Input events need no render thread: does nothing.
     virtual void OnInput(long long event) = 0;
 
-    /// [posts] The part of the window that the tasks posted from here to Render() draw, in pixels,
-    /// y growing downward; @p rotation of the content in quarter turns.
+    /// [posts] The part of the window that the tasks posted until Render() draw: pixels, y downward;
+    /// @p rotation of the content in quarter turns, 0 to 3. Its rules: docs/partial-update.md.
     virtual void ApplyUpdateRect(const RectF& rect, int rotation) = 0;
 
     /// Whether there is a window now; read without waiting for surface events under way.

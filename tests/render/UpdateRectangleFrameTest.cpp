@@ -250,6 +250,20 @@ TEST(UpdateRectangleFrame, TilingWithADamageRegionSetsIt)
     EXPECT_EQ(window.driver.Log().size(), 0u);
 }
 
+TEST(UpdateRectangleFrame, TilingWithoutAHistoryStartsOnTheDirtyRectangle)
+{
+    // Given a device whose mode keeps no history, and a back buffer that is known
+    UpdateWindow window(
+        WithAge(PlainDevice().WithPostSubBuffer().WithGlExtension("GL_QCOM_tiled_rendering"), 2));
+    const auto rectangle = window.Rectangle();
+    window.Swap();
+    UpdateRectangleModes::Set(*rectangle, 0x21, 0);
+
+    rectangle->UseRect(kDirty, 0);
+
+    EXPECT_EQ(Tilings(window), Texts{"glStartTilingQCOM(100, 1660, 200, 60, 0)"});
+}
+
 TEST(UpdateRectangleFrame, RefusedDamageRegionIsLoggedAndTheFrameGoesOn)
 {
     UpdateWindow window(WithAge(DamageDevice(), 2));
