@@ -6,8 +6,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 #include <map>
-#include <utility>
 
 namespace Ink
 {
@@ -17,19 +17,31 @@ namespace
 using Json = nlohmann::json;
 
 constexpr std::size_t kMostValues = 16000000;
+constexpr const char* kColumns[] = {"x", "y", "time", "pressure", "buttons", "tiltX", "tiltY"};
+constexpr std::size_t kLongestString = 1u << 20; // the parser holds several copies of one
 constexpr double kSteadyRate = 0.008; // seconds between samples, where a recording has no times
 
 /// What the file holds, as far as either shape can have it: under each name, a list of numbers or a
-/// list of points. A stream of events instead of a tree, whose size would be many times the file's.
+/// list of points. A stream of events instead of a tree, whose size would be many times the file's;
+/// numbers of no known name are not kept, points become samples at once.
 class Content : public nlohmann::json_sax<Json>
 {
 public:
-    using Point = std::vector<double>;
+    /// Points that cannot be samples are reported in @p line.
+    Content(const std::string& path, std::size_t line) : strokes(path), m_line(line) {}
 
     std::map<std::string, std::vector<double>> columns;
-    std::vector<std::pair<std::string, std::vector<Point>>> strokes;
+    RecordingBuilder strokes;
+    bool hasStrokes = false;
     std::string problem;
     std::size_t offset = 0;
+
+    /// Whether the list of that name holds a number.
+    bool HasColumn(const std::string& name) const
+    {
+        const auto column = columns.find(name);
+        return column != columns.end() && !column->second.empty();
+    }
 
     bool null() override { return true; }
     bool boolean(bool) override { return true; }
@@ -84,15 +96,11 @@ private:
     void BeginList(const std::string& name)
     {
         m_name = name;
-        m_column = nullptr;
-        m_hasStroke = false;
-    }
-    /// The current list as a list of numbers. Looked up once a list: names may be long.
-    std::vector<double>& Column()
-    {
-        if (!m_column)
-            m_column = &columns[m_name];
-        return *m_column;
+        const bool isKnown =
+            std::find(std::begin(kColumns), std::end(kColumns), name) != std::end(kColumns);
+        m_column = isKnown ? &columns[name] : nullptr;
+        strokes.Break();
+        m_start = m_time;
     }
     bool Number(double value)
     {
@@ -101,8 +109,8 @@ private:
             problem = "more than 16000000 numbers";
             return false;
         }
-        if (m_depth == kList)
-            Column().push_back(value);
+        if (m_depth == kList && m_column)
+            m_column->push_back(value);
         else if (m_depth == kPoint && m_coordinate < 4)
         {
             if (m_point.size() <= m_coordinate)
@@ -119,22 +127,35 @@ private:
     }
     bool EndPoint()
     {
-        if (!std::exchange(m_hasStroke, true))
-            strokes.emplace_back(m_name, std::vector<Point>());
         if (m_point.size() < 2 || std::isnan(m_point[0]) || std::isnan(m_point[1]))
         {
             problem = "a point of \"" + m_name + "\" has no x or no y";
             return false;
         }
-        strokes.back().second.push_back(m_point);
+        hasStrokes = true;
+        AddSample();
         return true;
     }
+    void AddSample()
+    {
+        Sample sample;
+        sample.x = static_cast<float>(m_point[0]);
+        sample.y = static_cast<float>(m_point[1]);
+        if (m_point.size() > 2 && std::isfinite(m_point[2]))
+            sample.pressure = static_cast<float>(std::clamp(m_point[2], 0.0, 1.0));
+        m_time = m_point.size() > 3 ? std::max(m_time, m_start + m_point[3] / 1000.0)
+                                    : m_time + kSteadyRate;
+        sample.time = m_time;
+        strokes.Add(sample, true, m_line);
+    }
 
+    std::size_t m_line;
     std::string m_name;
-    std::vector<double>* m_column = nullptr; ///< of the current list, once it has a number
-    bool m_hasStroke = false;                ///< the current list has a point
-    Point m_point;
+    std::vector<double>* m_column = nullptr; ///< of the current list, where its name is known
+    std::vector<double> m_point;
     std::size_t m_coordinate = 0;
+    double m_start = 0.0; ///< the time at which the current list began
+    double m_time = 0.0;
     std::size_t m_count = 0;
     int m_depth = 0;
 };
@@ -153,11 +174,10 @@ public:
     }
 
     std::size_t Count() const { return m_count; }
-    bool Has(const std::string& name) const { return m_content.columns.count(name) != 0; }
+    bool Has(const std::string& name) const { return m_content.HasColumn(name); }
     double At(const std::string& name, std::size_t row, double otherwise) const
     {
-        const auto column = m_content.columns.find(name);
-        return column == m_content.columns.end() ? otherwise : column->second[row];
+        return Has(name) ? m_content.columns.at(name)[row] : otherwise;
     }
 
 private:
@@ -187,26 +207,20 @@ void AddEvents(const Content& content, RecordingBuilder& builder, std::size_t li
     }
 }
 
-void AddStrokes(const Content& content, RecordingBuilder& builder, std::size_t line)
+/// Where the first string begins that is too long; the size of the text where none is.
+std::size_t FindLongString(const std::string& text)
 {
-    double time = 0.0;
-    for (const auto& [name, points] : content.strokes)
+    std::size_t start = text.find('"');
+    while (start != std::string::npos)
     {
-        builder.Break();
-        const double start = time;
-        for (const Content::Point& point : points)
-        {
-            Sample sample;
-            sample.x = static_cast<float>(point[0]);
-            sample.y = static_cast<float>(point[1]);
-            if (point.size() > 2 && std::isfinite(point[2]))
-                sample.pressure = static_cast<float>(std::clamp(point[2], 0.0, 1.0));
-            time =
-                point.size() > 3 ? std::max(time, start + point[3] / 1000.0) : time + kSteadyRate;
-            sample.time = time;
-            builder.Add(sample, true, line);
-        }
+        std::size_t end = start + 1;
+        while (end < text.size() && text[end] != '"')
+            end += text[end] == '\\' ? 2 : 1;
+        if (end - start > kLongestString)
+            return start;
+        start = end < text.size() ? text.find('"', end + 1) : std::string::npos;
     }
+    return text.size();
 }
 
 } // namespace
@@ -214,19 +228,21 @@ void AddStrokes(const Content& content, RecordingBuilder& builder, std::size_t l
 Recording ReadInkJson(const std::string& path, const std::string& text)
 {
     RecordingBuilder builder(path);
-    Content content;
-    const auto lastLine = static_cast<std::size_t>(1 + std::count(text.begin(), text.end(), '\n'));
-    if (!Json::sax_parse(text, &content))
+    const auto lineAt = [&text](std::size_t offset)
     {
-        const auto end =
-            text.begin() + static_cast<std::ptrdiff_t>(std::min(content.offset, text.size()));
-        const auto line = 1 + std::count(text.begin(), end, '\n');
-        builder.Fail(static_cast<std::size_t>(line), content.problem);
-    }
-    if (content.columns.count("x") && content.columns.count("y"))
+        const auto end = text.begin() + static_cast<std::ptrdiff_t>(std::min(offset, text.size()));
+        return static_cast<std::size_t>(1 + std::count(text.begin(), end, '\n'));
+    };
+    const std::size_t lastLine = lineAt(text.size());
+    if (const std::size_t offset = FindLongString(text); offset != text.size())
+        builder.Fail(lineAt(offset), "a string is longer than 1 MiB");
+    Content content(path, lastLine);
+    if (!Json::sax_parse(text, &content))
+        builder.Fail(lineAt(content.offset), content.problem);
+    if (content.HasColumn("x") && content.HasColumn("y"))
         AddEvents(content, builder, lastLine);
-    else if (!content.strokes.empty())
-        AddStrokes(content, builder, lastLine);
+    else if (content.hasStrokes)
+        return content.strokes.Finish(lastLine);
     else
         builder.Fail(1, "neither pointer events nor lists of points");
     return builder.Finish(lastLine);

@@ -20,6 +20,11 @@ namespace
 constexpr int kDeepestElement = 256;
 constexpr std::size_t kMostChannels = 64;
 
+// A parsed element takes many times the memory of its text.
+constexpr std::size_t kLargestText = 64u << 20;
+constexpr std::size_t kMostTags = 500000;
+constexpr std::size_t kMostAttributes = 500000;
+
 /// The name without its namespace prefix.
 std::string_view LocalName(const pugi::xml_node& node)
 {
@@ -48,6 +53,7 @@ public:
 
     Recording Read()
     {
+        CheckSize();
         pugi::xml_document document;
         const pugi::xml_parse_result result =
             document.load_buffer(m_text.data(), m_text.size(), pugi::parse_default);
@@ -72,6 +78,22 @@ private:
             std::clamp<std::ptrdiff_t>(offset, 0, static_cast<std::ptrdiff_t>(m_text.size()));
         const auto line = 1 + std::count(m_text.begin(), end, '\n');
         throw ReadError(m_path, static_cast<std::size_t>(line), problem);
+    }
+
+    /// Refuses what would take too much memory, before any is taken. An equals sign outside of a tag
+    /// counts, too: there are few in a recording.
+    void CheckSize() const
+    {
+        if (m_text.size() > kLargestText)
+            Fail(0, "larger than 64 MiB, for InkML");
+        std::size_t tags = 0, attributes = 0;
+        for (const char& c : m_text)
+        {
+            if (c == '<' && ++tags > kMostTags)
+                Fail(&c - m_text.data(), "more than 500000 tags");
+            if (c == '=' && ++attributes > kMostAttributes)
+                Fail(&c - m_text.data(), "more than 500000 attributes");
+        }
     }
 
     /// Every node below @p root in document order, without recursion: depth is the file's choice.

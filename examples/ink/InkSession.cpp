@@ -119,14 +119,31 @@ void InkSession::Draw(InkPiece piece)
     PostGuarded([piece = std::move(piece)](GlState& gl) { gl.painter.Paint(piece, *gl.page); });
 }
 
+namespace
+{
+
+/// The rectangle as the render thread takes it. Where a part of the buffer is posted its rows count
+/// from the bottom, and no render thread says whether it does so: there, what is named is right both
+/// ways up.
+Nib::RectF PresentedRect(const Nib::RectF& visible, float height)
+{
+    Nib::RectF named = visible;
+    if (Nib::Egl::GetInstance()->IsEglExtensionSupported("EGL_NV_post_sub_buffer"))
+        named.Union({visible.left, height - visible.bottom, visible.right, height - visible.top});
+    return named;
+}
+
+} // namespace
+
 void InkSession::Present()
 {
     Nib::RectF visible(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
     if (m_dirty.IsEmpty() || !visible.Intersect(m_dirty))
         visible.Set(0.0f, 0.0f, 0.0f, 0.0f);
+    visible.ExtendRect(); // a fraction of a pixel would not be presented
     m_dirty.Set(0.0f, 0.0f, 0.0f, 0.0f);
 
-    m_thread.ApplyUpdateRect(visible, 0);
+    m_thread.ApplyUpdateRect(PresentedRect(visible, static_cast<float>(m_height)), 0);
     PostGuarded(
         [visible](GlState& gl)
         {

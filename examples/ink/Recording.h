@@ -47,7 +47,8 @@ public:
 /// - tablet samples behind their count (SvcFile.h);
 /// - JSON, of pointer events or of named lists of points (InkJson.h);
 /// - strokes between the words START and BREAK (StrokeList.h).
-/// A file may have 128 MiB and 4,000,000 samples.
+/// A file may have 128 MiB and 4,000,000 samples; InkML 64 MiB, 500,000 tags and as many attributes.
+/// Reading takes less than 512 MiB of memory, and time in proportion to the size of the file.
 Recording ReadRecording(const std::string& path);
 
 } // namespace Ink

@@ -144,7 +144,7 @@ TEST(InkMlSize, ElementsMayStandTwoHundredFiftySixDeep)
     EXPECT_EQ(ErrorOf(Ink::ReadInkMl, nested(254) + "</ink>"), "no error");
     EXPECT_EQ(ErrorOf(Ink::ReadInkMl, nested(255) + "</ink>"),
               "file:1: the elements are nested too deeply");
-    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, nested(300000) + "</ink>"),
+    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, nested(200000) + "</ink>"),
               "file:1: the elements are nested too deeply");
 }
 
@@ -155,6 +155,32 @@ TEST(InkMlSize, AFormatMayHaveSixtyFourChannels)
               "no error");
     EXPECT_EQ(ErrorOf(Ink::ReadInkMl, InkMl(Repeated(63, "<channel name=\"Q\"/>"), traces)),
               "file:1: the trace format has more than 64 channels");
+}
+
+TEST(InkMlSize, AFileMayHaveFiveHundredThousandTags)
+{
+    const auto withTags = [](int count)
+    { return "<ink><trace>1 2</trace>" + Repeated(count - 4, "<a/>") + "</ink>"; };
+    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, withTags(500000)), "no error");
+    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, "\n" + withTags(500001)), "file:2: more than 500000 tags");
+}
+
+TEST(InkMlSize, AFileMayHaveFiveHundredThousandAttributes)
+{
+    const auto withAttributes = [](int count)
+    { return "<ink" + Repeated(count, " a=''") + "><trace>1 2</trace></ink>"; };
+    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, withAttributes(500000)), "no error");
+    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, withAttributes(500001)),
+              "file:1: more than 500000 attributes");
+}
+
+TEST(InkMlSize, AFileMayHaveSixtyFourMebibytes)
+{
+    const std::string text = "<ink><trace>1 2</trace></ink>";
+    const std::string blanks((64u << 20) - text.size(), ' ');
+    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, text + blanks), "no error");
+    EXPECT_EQ(ErrorOf(Ink::ReadInkMl, text + blanks + " "),
+              "file:1: larger than 64 MiB, for InkML");
 }
 
 TEST(InkMlSize, AContextIsSearchedOnceForAllItsTraces)
@@ -172,11 +198,30 @@ TEST(InkMlSize, AContextIsSearchedOnceForAllItsTraces)
 TEST(InkJsonSize, LongNamesAreLookedUpOnceAList)
 {
     // Quadratic, this would take much longer than a test may.
-    const std::string name(2000000, 'k');
+    const std::string name(1000000, 'k');
     const Recording recording =
         Ink::ReadInkJson("file", "{\"" + name + "\":[" + Repeated(200000, "[1,2],") + "[1,2]]}");
     EXPECT_EQ(recording.strokes.size(), 1u);
     EXPECT_EQ(recording.strokes[0].size(), 200001u);
+}
+
+TEST(InkJsonSize, AStringMayHaveAMebibyte)
+{
+    const auto named = [](std::size_t length)
+    { return "{\n\"" + std::string(length - 1, 'k') + "\":[[1,2]]}"; };
+    EXPECT_EQ(ErrorOf(Ink::ReadInkJson, named(1u << 20)), "no error");
+    EXPECT_EQ(ErrorOf(Ink::ReadInkJson, named((1u << 20) + 1)),
+              "file:2: a string is longer than 1 MiB");
+    EXPECT_EQ(ErrorOf(Ink::ReadInkJson, "{\"" + std::string(2u << 20, '\\')),
+              "file:1: a string is longer than 1 MiB"); // escapes, and no end
+}
+
+TEST(InkJsonSize, NumbersOfNoKnownNameAreNotKept)
+{
+    EXPECT_EQ(ErrorOf(Ink::ReadInkJson, "{\"a\":[1,2,3],\"x\":[1],\"y\":[2],\"b\":[1]}"),
+              "no error");
+    EXPECT_EQ(ErrorOf(Ink::ReadInkJson, "{\"a\":[1,2,3],\"x\":[1]}"),
+              "file:1: neither pointer events nor lists of points");
 }
 
 TEST(InkJsonSize, EachListOfPointsIsAStroke)
