@@ -13,7 +13,6 @@ namespace Oracle
 namespace
 {
 
-constexpr unsigned kAlignToTiles = 0x02;
 constexpr unsigned kKeepHistory = 0x04;
 constexpr unsigned kPostSubBuffer = 0x80;
 constexpr unsigned kTiledRenderingMode = 0x25;
