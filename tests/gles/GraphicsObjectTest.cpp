@@ -343,6 +343,21 @@ TEST_F(MeshTest, DrawOfAGivenModeTakesItsFirstVertex)
     EXPECT_EQ(driver.LastCall("glDrawArrays"), Call("glDrawArrays", GL_TRIANGLES, 0, 1));
 }
 
+TEST_F(MeshTest, DrawOfAGivenModeSetsUpTheAttributesToo)
+{
+    const Mesh mesh = Made(3);
+    mesh->Draw(PrimitiveType::Points, 1, 2, false);
+    EXPECT_EQ(
+        driver.Calls(),
+        Sequence({Call("glBindBuffer", GL_ARRAY_BUFFER, 1), Call("glEnableVertexAttribArray", 0),
+                  Call("glVertexAttribPointer", 0, 2, GL_FLOAT, GL_FALSE, 12, nullptr),
+                  Call("glEnableVertexAttribArray", 1),
+                  Call("glVertexAttribPointer", 1, 4, GL_BYTE, GL_FALSE, 12,
+                       reinterpret_cast<const void*>(8)),
+                  Call("glDrawArrays", GL_POINTS, 1, 2),
+                  Call("glBindBuffer", GL_ARRAY_BUFFER, 0)}));
+}
+
 TEST_F(MeshTest, MeshTypeIsTheModeOfLaterDraws)
 {
     const Mesh mesh = Made(4);

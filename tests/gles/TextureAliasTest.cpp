@@ -113,6 +113,29 @@ TEST_F(TextureAlias, PlainOneKeepsDeadNamesAfterALoss)
     EXPECT_EQ(source->internals().glID, 2u);
 }
 
+TEST_F(TextureAlias, PlainOneBindsTheNamesItWasMadeWith)
+{
+    const Texture source = Made();
+    const Texture alias = Of(source);
+    source->SetDescriptor(Made(4, 4)->GetDescriptor()); // has another name then
+    ASSERT_NE(source->internals().glID, 1u);
+    driver.AllowMisuse("glBindTexture"); // the names are dead
+    driver.AllowMisuse("glBindSampler");
+    Forget();
+    alias->Activate(0);
+    EXPECT_EQ(driver.LastCall("glBindTexture").Arg(1), 1);
+}
+
+TEST_F(TextureAlias, ReleasedByHandForgetsTheFenceAlone)
+{
+    const Texture source = Made(2, 2, true);
+    const Texture alias = Of(source);
+    alias->ReleaseGLObject();
+    EXPECT_EQ(alias->internals().fence.Get(), nullptr);
+    EXPECT_NE(source->internals().fence.Get(), nullptr);
+    EXPECT_EQ(driver.Live().syncs, 1);
+}
+
 TEST_F(TextureAlias, ReleasedByHandForgetsItsNamesAlone)
 {
     const Texture source = Made();
@@ -140,6 +163,18 @@ TEST_F(TextureAlias, RestoredBeforeItsSourceTakesUpItsNamesWhenUsed)
     EXPECT_EQ(driver.CallCount(), 3u);
 }
 
+TEST_F(TextureAlias, RestoredBeforeItsSourceTakesUpItsNamesForAParameter)
+{
+    const Texture alias = Made();
+    const Texture source = Made(5, 5);
+    alias->SetDescriptor(TextureDescriptor(source.get()));
+    queue.observer.DispatchRelease();
+    queue.observer.DispatchRestore();
+    Forget();
+    alias->SetParam(Nib::kTextureParamWrapS, Nib::kTextureWrapRepeat);
+    EXPECT_EQ(driver.LastCall("glSamplerParameteri").Arg(0), source->internals().sampler);
+}
+
 TEST_F(TextureAlias, MadeOfASubscribedTextureIsRestoredWithoutCountingAgain)
 {
     const Texture source = Made();
@@ -161,6 +196,7 @@ TEST_F(TextureAlias, OfAnAliasWaitsForTheWholeLine)
     const Texture first = Of(source);
     const Texture second = Of(first);
     second->Activate(0);
+    EXPECT_EQ(driver.CallCount("glWaitSync"), 1u);
     first->Activate(1);
     source->Activate(2);
     EXPECT_EQ(driver.CallCount("glWaitSync"), 1u);
@@ -174,6 +210,7 @@ TEST_F(TextureAlias, SiblingsWaitOnce)
     const Texture first = Of(source);
     const Texture second = Of(source);
     first->Activate(0);
+    EXPECT_EQ(driver.CallCount("glWaitSync"), 1u);
     second->Activate(0);
     source->Activate(0);
     EXPECT_EQ(driver.CallCount("glWaitSync"), 1u);

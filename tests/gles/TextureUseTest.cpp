@@ -132,6 +132,7 @@ TEST_F(TextureUse, FenceOfAnAliasIsWaitedForOnceByWhoeverComesFirst)
         const Texture alias = Alias(*texture);
         Forget();
         (aliasFirst ? alias : texture)->Activate(0);
+        EXPECT_EQ(driver.CallCount("glWaitSync"), 1u);
         (aliasFirst ? texture : alias)->Activate(0);
         EXPECT_EQ(driver.CallCount("glWaitSync"), 1u);
         EXPECT_EQ(driver.CallCount("glDeleteSync"), 1u);
@@ -325,6 +326,14 @@ TEST_F(TextureUse, TagKeeps126Characters)
                    std::string(200, 'x') + ", strLen = 126, mTexture->internals().tag = short"}));
 }
 
+TEST_F(TextureUse, ShorterTagLeavesNothingOfALongerOne)
+{
+    const Texture texture = Made(2, 2);
+    texture->SetTag("longer");
+    texture->SetTag("ink");
+    EXPECT_STREQ(texture->GetTag(), "ink");
+}
+
 TEST_F(TextureUse, SetDescriptorOfTheSameTextureDoesNothing)
 {
     const Texture texture = Made(2, 2);
@@ -479,4 +488,15 @@ TEST_F(TextureUse, DestructionAfterReleaseTouchesNothing)
     texture.reset();
     EXPECT_EQ(driver.CallCount(), 0u);
     EXPECT_EQ(driver.CountLogContaining("FREE."), 0u);
+}
+
+TEST_F(TextureUse, SecondReleaseTouchesNothing)
+{
+    const Texture texture = Made(2, 2);
+    texture->ReleaseGLObject();
+    Forget();
+    texture->ReleaseGLObject();
+    EXPECT_EQ(driver.CallCount(), 0u);
+    EXPECT_EQ(Infos(), (Texts{"virtual void Nib::GLES::TextureObject::ReleaseGLObject() - Release "
+                              "Was called. Texture - 0"}));
 }
