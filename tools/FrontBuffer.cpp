@@ -1,14 +1,12 @@
 #include "FrontBuffer.h"
 
 #include <cstdio>
-#include <string>
 
-namespace
+std::string FrontBufferObstacle()
 {
-
-/// Why Nib::IsFBRSupported() says no, in its order.
-std::string Obstacle()
-{
+    if (Nib::IsFBRSupported())
+        return {};
+    // In the order in which the library asks.
     const Nib::Egl& egl = *Nib::Egl::GetInstance();
     for (const char* extension :
          {"EGL_KHR_mutable_render_buffer", "EGL_KHR_fence_sync", "EGL_ANDROID_get_frame_timestamps",
@@ -20,13 +18,12 @@ std::string Obstacle()
     return "it is known not to work on this GPU";
 }
 
-} // namespace
-
 std::unique_ptr<Nib::RenderThreadGL> FrontBufferThread(Nib::RenderThreadGL& parent)
 {
-    if (Nib::IsFBRSupported())
+    const std::string obstacle = FrontBufferObstacle();
+    if (obstacle.empty())
         return std::unique_ptr<Nib::RenderThreadGL>(
             Nib::RendererFactory::CreateFBRSurfaceRenderer(parent.GetMsgQueue(), "nib front"));
-    std::fprintf(stderr, "nib: --front-buffer: %s; drawing frames instead\n", Obstacle().c_str());
+    std::fprintf(stderr, "nib: --front-buffer: %s; drawing frames instead\n", obstacle.c_str());
     return nullptr;
 }

@@ -4,6 +4,10 @@
 #include <nib/nib.h>
 
 #include <memory>
+#include <string>
+
+/// Why the device cannot have a front-buffer render thread; empty where it can.
+std::string FrontBufferObstacle();
 
 /// A front-buffer render thread beside @p parent, not started; null, after one line on standard
 /// error that says why, where the device cannot have one.

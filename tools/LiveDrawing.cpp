@@ -42,6 +42,24 @@ void PrintStart(const PageFiles& files)
 
 } // namespace
 
+void DrawUntilClosed(LiveWindow& window, LiveSession& session,
+                     const std::function<void()>& beforeFrame)
+{
+    std::vector<LiveEvent> events;
+    bool isOpen = true;
+    while (isOpen)
+    {
+        isOpen = window.WaitForEvents(events);
+        for (const LiveEvent& event : events)
+            session.Handle(event);
+        if (beforeFrame)
+            beforeFrame();
+        if (isOpen)
+            session.ShowFrame();
+    }
+    session.Finish();
+}
+
 LiveDrawing::LiveDrawing(const DrawOptions& options)
     : m_options(options), m_size(ParseSize(options.size)),
       m_files(options.output.empty() ? FilesOfNow() : FilesFor(options.output)),
@@ -52,7 +70,7 @@ LiveDrawing::LiveDrawing(const DrawOptions& options)
 
 void LiveDrawing::Run()
 {
-    LiveWindow window("nib draw", m_size.width, m_size.height, m_document.EndTime());
+    LiveWindow window("--live", "nib draw", m_size.width, m_size.height, m_document.EndTime());
     CheckEgl();
     const std::unique_ptr<Nib::RenderThreadGL> parent = StartSurfaceThread();
     std::unique_ptr<Nib::RenderThreadGL> child; // ended before its parent
@@ -72,17 +90,7 @@ void LiveDrawing::DrawOn(Nib::RenderThreadGL& thread, LiveWindow& window)
     CheckDrawn(ink.Error());
     PrintStart(m_files);
 
-    std::vector<LiveEvent> events;
-    bool isOpen = true;
-    while (isOpen)
-    {
-        isOpen = window.WaitForEvents(events);
-        for (const LiveEvent& event : events)
-            session.Handle(event);
-        if (isOpen)
-            session.ShowFrame();
-    }
-    session.Finish();
+    DrawUntilClosed(window, session);
     if (!m_options.output.empty())
         session.Save();
     CheckDrawn(ink.Error());

@@ -9,6 +9,15 @@
 
 #include <nib/nib.h>
 
+#include <functional>
+
+class LiveSession;
+
+/// Hands @p session what the user does in @p window, and shows it frame by frame, until the window
+/// is closed. @p beforeFrame is called before each frame; it may be null.
+void DrawUntilClosed(LiveWindow& window, LiveSession& session,
+                     const std::function<void()>& beforeFrame = nullptr);
+
 /// One run of `nib draw --live`. Throws UserError and Ink::ReadError.
 class LiveDrawing
 {

@@ -16,13 +16,13 @@ constexpr int kTip = 1; // the button that a pen's tip and a mouse's main button
 
 /// Turns on the pointer events of every pointer, and gives the number by which the extension's
 /// events are known.
-int SelectPointers(Display* display, Window window)
+int SelectPointers(Display* display, Window window, const std::string& option)
 {
     int opcode = 0, firstEvent = 0, firstError = 0;
     int major = 2, minor = 0;
     if (!XQueryExtension(display, "XInputExtension", &opcode, &firstEvent, &firstError) ||
         XIQueryVersion(display, &major, &minor) != 0)
-        throw UserError("--live: the X server has no XInput 2");
+        throw UserError(option + ": the X server has no XInput 2");
     unsigned char bits[XIMaskLen(XI_LASTEVENT)] = {};
     for (const int event : {XI_ButtonPress, XI_ButtonRelease, XI_Motion, XI_DeviceChanged})
         XISetMask(bits, event);
@@ -93,10 +93,11 @@ std::optional<LiveEvent::Kind> Command(Display* display, const XKeyEvent& key)
 class LiveWindow::Input
 {
 public:
-    Input(const std::string& title, int width, int height, double startTime)
-        : connection("--live", title, width, height, XConnection::Sizing::Free),
-          m_opcode(SelectPointers(connection.Get(), connection.Handle())), m_pens(startTime),
-          m_width(width), m_height(height)
+    Input(const std::string& option, const std::string& title, int width, int height,
+          double startTime)
+        : connection(option, title, width, height, XConnection::Sizing::Free),
+          m_opcode(SelectPointers(connection.Get(), connection.Handle(), option)),
+          m_pens(startTime), m_width(width), m_height(height)
     {
         connection.Show(KeyPressMask | ExposureMask);
     }
@@ -174,8 +175,9 @@ private:
     int m_height;
 };
 
-LiveWindow::LiveWindow(const std::string& title, int width, int height, double startTime)
-    : m_input(std::make_unique<Input>(title, width, height, startTime))
+LiveWindow::LiveWindow(const std::string& option, const std::string& title, int width, int height,
+                       double startTime)
+    : m_input(std::make_unique<Input>(option, title, width, height, startTime))
 {
 }
 

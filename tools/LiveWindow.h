@@ -12,9 +12,10 @@
 class LiveWindow
 {
 public:
-    /// Samples count their time from @p startTime, in seconds. Throws UserError when there is no
-    /// display, or one without XInput 2.
-    LiveWindow(const std::string& title, int width, int height, double startTime);
+    /// Samples count their time from @p startTime, in seconds. Throws UserError, which names
+    /// @p option, when there is no display, or one without XInput 2.
+    LiveWindow(const std::string& option, const std::string& title, int width, int height,
+               double startTime);
     ~LiveWindow();
 
     LiveWindow(const LiveWindow&) = delete;

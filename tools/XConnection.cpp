@@ -74,6 +74,9 @@ void XConnection::Show(long events)
         XWindowEvent(m_display, m_window, StructureNotifyMask, &event);
         Watch(event);
     }
+    XSync(m_display, False);
+    for (XEvent event{}; XCheckTypedWindowEvent(m_display, m_window, Expose, &event);)
+        continue; // nothing has been drawn yet that could be lost
 }
 
 int XConnection::Pending()

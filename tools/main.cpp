@@ -1,6 +1,7 @@
 #include "DrawCommand.h"
 #include "Drawing.h"
 #include "InfoCommand.h"
+#include "LatencyCommand.h"
 #include "LiveDrawing.h"
 #include "Recording.h"
 #include "UserError.h"
@@ -43,6 +44,7 @@ int main(int argc, char** argv)
     app.require_subcommand(1);
     AddDrawCommand(app, &Draw);
     AddInfoCommand(app);
+    AddLatencyCommand(app);
     try
     {
         app.parse(argc, argv);

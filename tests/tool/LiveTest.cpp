@@ -4,6 +4,7 @@
 #include "RunNib.h"
 #include "TestScreen.h"
 
+#include <chrono>
 #include <cstdio>
 #include <gtest/gtest.h>
 #include <map>
@@ -399,6 +400,24 @@ protected:
             TheHand().MoveTo(kHook[i]);
     }
 
+    /// With the last place the way to the one before has become certain, and is shown.
+    void WaitUntilAllIsTaken() const
+    {
+        const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(20);
+        while (!IsInkAround(kHook[kHook.size() - 2]))
+            ASSERT_LT(std::chrono::steady_clock::now(), deadline);
+    }
+
+    bool IsInkAround(const Spot& spot) const
+    {
+        const Picture shown = m_screen.Content(*m_window, kWidth, kHeight);
+        for (int y = spot.y - 4; y <= spot.y + 4; ++y)
+            for (int x = spot.x - 4; x <= spot.x + 4; ++x)
+                if (shown.IsInk(x, y))
+                    return true;
+        return false;
+    }
+
     /// A frame may be under way to a window that is gone; see the file.
     void AllowDriverLeaks()
     {
@@ -436,6 +455,7 @@ TEST_F(LiveEnd, OfTheConnection)
 {
     AllowDriverLeaks();
     BeginStroke();
+    WaitUntilAllIsTaken(); // a connection that breaks takes with it what was not read from it
     XKillClient(m_screen.Connection(), *m_window);
     XSync(m_screen.Connection(), False);
     ExpectClean(Nib().Finish());
