@@ -7,6 +7,8 @@
 #include <nib/export.h>
 
 #include <atomic>
+#include <cstddef>
+#include <new>
 #include <utility>
 
 namespace Nib
@@ -33,6 +35,9 @@ struct QueueItemBase
 /// Failure  a task has no result, and nobody catches what run() throws.
 ///
 /// A task is in one queue at most and is never queued again.
+///
+/// What `new` and `delete` take for a task of up to 256 bytes is kept for the next tasks, whichever
+/// threads make and delete them, so that posting does not allocate in the long run.
 class NIB_EXPORT ITask : public QueueItemBase<ITask>
 {
 public:
@@ -48,6 +53,29 @@ public:
     /// Whether a worker in global-lock mode runs this task inside the process-wide guard. True
     /// here.
     virtual bool isGlobalLockAllowed();
+
+    /// From what earlier tasks left, else from the heap; throws std::bad_alloc. Any thread.
+    static void* operator new(std::size_t size);
+    /// Any thread, not only that which made the task.
+    static void operator delete(void* memory, std::size_t size) noexcept;
+    /// Over-aligned tasks, always from the heap.
+    static void* operator new(std::size_t size, std::align_val_t alignment)
+    {
+        return ::operator new(size, alignment);
+    }
+    /// Over-aligned tasks.
+    static void operator delete(void* memory, std::size_t, std::align_val_t alignment) noexcept
+    {
+        ::operator delete(memory, alignment);
+    }
+    /// At a given place.
+    static void* operator new(std::size_t, void* place) noexcept { return place; }
+    /// After a constructor at a given place threw.
+    static void operator delete(void*, void*) noexcept {}
+    /// Null instead of an exception.
+    static void* operator new(std::size_t size, const std::nothrow_t&) noexcept;
+    /// After a constructor of such a task threw.
+    static void operator delete(void* memory, const std::nothrow_t&) noexcept;
 };
 
 /// Wrappers of one call each: of a member function on an object, which must outlive the task, or of

@@ -108,6 +108,10 @@ constexpr std::array kBase = {
 
 constexpr std::array kThreads = {
     "Nib::ITask::isGlobalLockAllowed()",
+    "Nib::ITask::operator new(unsigned long)",
+    "Nib::ITask::operator new(unsigned long, std::nothrow_t const&)",
+    "Nib::ITask::operator delete(void*, unsigned long)",
+    "Nib::ITask::operator delete(void*, std::nothrow_t const&)",
     "Nib::IWorkerThread::CreateInstance_NoLock(char const*, int)",
     "Nib::IWorkerThread::CreateInstance_GlobalLock(char const*, int)",
     "Nib::IWorkerThread::CreatePoolInstance(char const*, int, int)",

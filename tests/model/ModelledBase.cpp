@@ -1,5 +1,5 @@
-// The base library for modelled threads: its locks, conditions and threads are the explorer's, and
-// nothing is logged or watched.
+// The base library for modelled threads: its locks, conditions and threads are the explorer's,
+// tasks come from the heap, and nothing is logged or watched.
 
 #include "ModelAtomic.h"
 
@@ -117,6 +117,25 @@ void Thread::join() noexcept
 std::uint64_t GetNibCurrentThreadId() noexcept
 {
     return static_cast<std::uint64_t>(Model::Self()) + 1;
+}
+
+// ---- tasks, on the heap -------------------------------------------------------------------------
+
+ITask::~ITask() = default;
+
+bool ITask::isGlobalLockAllowed()
+{
+    return true;
+}
+
+void* ITask::operator new(std::size_t size)
+{
+    return ::operator new(size);
+}
+
+void ITask::operator delete(void* memory, std::size_t) noexcept
+{
+    ::operator delete(memory);
 }
 
 // ---- the watchdog, which is off -----------------------------------------------------------------

@@ -3,5 +3,4 @@
 #include "ModelAtomic.h"
 
 #include "thread/GlobalLocker.cpp"
-#include "thread/Task.cpp"
 #include "thread/WorkerThreadImpl.cpp"

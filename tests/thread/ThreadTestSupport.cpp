@@ -62,6 +62,8 @@ namespace
 {
 
 thread_local long t_allocations = 0;
+std::atomic<long> g_allocations{0};
+std::atomic<long> g_frees{0};
 
 } // namespace
 
@@ -69,21 +71,36 @@ void* operator new(std::size_t size)
 {
     ++t_allocations;
     if (void* memory = std::malloc(size != 0 ? size : 1))
+    {
+        g_allocations.fetch_add(1, std::memory_order_relaxed);
         return memory;
+    }
     throw std::bad_alloc();
 }
 
 void operator delete(void* memory) noexcept
 {
+    if (memory)
+        g_frees.fetch_add(1, std::memory_order_relaxed);
     std::free(memory);
 }
 
 void operator delete(void* memory, std::size_t) noexcept
 {
-    std::free(memory);
+    operator delete(memory);
 }
 
 long AllocationsSoFar()
 {
     return t_allocations;
+}
+
+long AllocationsOfAllThreads()
+{
+    return g_allocations.load();
+}
+
+long LiveAllocations()
+{
+    return g_allocations.load() - g_frees.load();
 }

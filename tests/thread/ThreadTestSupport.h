@@ -171,4 +171,10 @@ void WaitForWaits(int before, int more);
 /// How often the calling thread has allocated since the start of the process.
 long AllocationsSoFar();
 
+/// How often any thread has.
+long AllocationsOfAllThreads();
+
+/// How many of these were not freed.
+long LiveAllocations();
+
 #endif
