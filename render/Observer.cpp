@@ -111,6 +111,24 @@ void Observer<IManagedObject>::DispatchRestore()
         dispatch.Call(position, &IManagedObject::OnRestore);
 }
 
+void Observer<IManagedObject>::DispatchRestore(
+    const std::function<void(const std::exception&)>& failed)
+{
+    AutoCriticalSection guard(m_lock);
+    Dispatch dispatch(*this);
+    for (Position position = m_subscribers.begin(); position != m_subscribers.end(); ++position)
+    {
+        try
+        {
+            dispatch.Call(position, &IManagedObject::OnRestore);
+        }
+        catch (const std::exception& failure)
+        {
+            failed(failure);
+        }
+    }
+}
+
 bool Observer<IManagedObject>::IsDispatching() const
 {
     return m_dispatchPosition != m_subscribers.end();

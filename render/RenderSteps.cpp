@@ -45,9 +45,11 @@ void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, E
     context.Destroy();
 }
 
-void RestoreObjects(Observer<IManagedObject>& observer)
+void RestoreObjects(Observer<IManagedObject>& observer, const char* function)
 {
-    observer.DispatchRestore();
+    observer.DispatchRestore(
+        [function](const std::exception& failure)
+        { NIB_LOG_ERROR("%s An object is not restored: %s", function, failure.what()); });
     ShaderManager::GetInstance()->OnRestoreContext();
 }
 

@@ -33,8 +33,9 @@ void DetachFromWindow(HybridSurface& surface, const char* function);
 void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, EglContext& context);
 
 /// Restores the subscribers of @p observer, first one first, and has the shader manager move its
-/// entries to the context that is now current.
-void RestoreObjects(Observer<IManagedObject>& observer);
+/// entries to the context that is now current. One that throws stays released, with a log line: the
+/// thread has nobody to catch it.
+void RestoreObjects(Observer<IManagedObject>& observer, const char* function);
 
 /// How a render thread gets the context to share with: it posts a task to its parent, which alone
 /// can tell its context and which then resumes the child's paused worker.

@@ -173,7 +173,7 @@ void RenderThreadFBRImpl::DoResume()
         return;
     }
     Egl::GetInstance()->MakeCurrent(&m_context, m_surface.GetActiveSurface());
-    RestoreObjects(m_observer);
+    RestoreObjects(m_observer, function);
 }
 
 // ---- the window ----

@@ -199,7 +199,7 @@ void RenderThreadOffscreenGLImpl::DoResume()
         return;
     }
     Egl::GetInstance()->MakeCurrent(&m_context, m_surface.get());
-    RestoreObjects(m_observer);
+    RestoreObjects(m_observer, function);
 }
 
 // ---- the queue ----

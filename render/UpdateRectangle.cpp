@@ -82,6 +82,8 @@ void UpdateRectangle::Init(EglSurface* surface)
 void UpdateRectangle::Init(EglSurface* surface, int width, int height)
 {
     m_surface = surface;
+    if (surface == nullptr) // neither window nor pbuffer could be made: nothing is presented
+        return SetScreenRect(width, height);
     if ((m_mode & kConfigured) == 0)
     {
         InitEGLExtensions();
@@ -205,6 +207,8 @@ void UpdateRectangle::UseRect(RectF dirty, int rotation)
 // What UseRect does where the GPU renders in tiles: only the tiles of the dirty area are drawn.
 void UpdateRectangle::RestrictToDirtyArea(const RectF& dirty, int rotation)
 {
+    if (m_surface == nullptr)
+        return;
     OpenGLRenderer::bindFramebuffer(FramebufferTarget::ReadAndDraw, 0);
     const RectF area =
         ClipToScreen(m_clipRect->AddUpdateRect(&dirty), {m_screenWidth, m_screenHeight});
@@ -280,14 +284,21 @@ void UpdateRectangle::Reset()
 
 bool UpdateRectangle::DoSwapBuffers()
 {
-    if ((m_mode & kPostSubBuffer) != 0)
-    {
-        return m_postSubBuffer(Display(), m_surface->Get(), m_damageRect.x, m_damageRect.y,
-                               m_damageRect.width, m_damageRect.height) == EGL_TRUE;
-    }
-    if (NeedsDamageRect())
-        return m_swapBuffersWithDamage(Display(), m_surface->Get(), &m_damageRect.x, 1) == EGL_TRUE;
-    return m_surface->SwapBuffers();
+    NIB_FUNCTION("bool Nib::UpdateRectangle::DoSwapBuffers()");
+    if ((m_mode & kPostSubBuffer) == 0 && !NeedsDamageRect())
+        return m_surface->SwapBuffers(); // logs for itself
+    if (PresentDamage() == EGL_TRUE)
+        return true;
+    NIB_LOG_ERROR("%s Failed. Err = %d", function, eglGetError());
+    return false;
+}
+
+EGLBoolean UpdateRectangle::PresentDamage()
+{
+    if ((m_mode & kPostSubBuffer) == 0)
+        return m_swapBuffersWithDamage(Display(), m_surface->Get(), &m_damageRect.x, 1);
+    return m_postSubBuffer(Display(), m_surface->Get(), m_damageRect.x, m_damageRect.y,
+                           m_damageRect.width, m_damageRect.height);
 }
 
 // ---- what it has come to ------------------------------------------------------------------------

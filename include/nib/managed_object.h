@@ -9,6 +9,8 @@
 #include <nib/export.h>
 
 #include <cstddef>
+#include <exception>
+#include <functional>
 #include <list>
 #include <unordered_map>
 
@@ -75,6 +77,10 @@ public:
     /// Calls OnRestore() of every subscriber, the first one first: what was made on top of another
     /// object is rebuilt after it. To be called when the new context is current.
     void DispatchRestore();
+
+    /// The same where nobody would catch what a subscriber throws: it goes to @p failed, and the
+    /// subscribers behind it are restored all the same.
+    void DispatchRestore(const std::function<void(const std::exception&)>& failed);
 
 private:
     class Dispatch;

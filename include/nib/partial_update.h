@@ -75,7 +75,8 @@ public:
     void Init(EglSurface* surface); ///< As below, with the size that the surface itself tells.
 
     /// Presents @p surface (borrowed, until the next Init) from now on. The first call decides the
-    /// update mode. The next frames redraw everything.
+    /// update mode. The next frames redraw everything. A null @p surface, where none could be made,
+    /// only takes the size.
     void Init(EglSurface* surface, int width, int height);
 
     // The steps of Init.
@@ -130,6 +131,7 @@ private:
 
     void RestrictToDirtyArea(const RectF& dirty, int rotation);
     void LogDamageRegionError() const;
+    EGLBoolean PresentDamage();
 
     EglSurface* m_surface; // not owned
     int m_hwRotation;      // quarter turns

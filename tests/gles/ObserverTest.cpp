@@ -344,6 +344,22 @@ TEST_F(ObserverTest, AnExceptionDuringARestoreEndsTheDispatchToo)
     EXPECT_TRUE(driver.Log().empty());
 }
 
+TEST_F(ObserverTest, ARestoreThatHandsExceptionsOverGoesOn)
+{
+    Add("a").onRestore = [] { throw std::runtime_error("from a"); };
+    Add("b");
+    Add("c").onRestore = [] { throw std::runtime_error("from c"); };
+    Events failures;
+
+    observer->DispatchRestore([&](const std::exception& failure)
+                              { failures.emplace_back(failure.what()); });
+
+    EXPECT_EQ(events, (Events{"restore a", "restore b", "restore c"}));
+    EXPECT_EQ(failures, (Events{"from a", "from c"}));
+    EXPECT_NO_THROW(RemoveAll());
+    EXPECT_TRUE(driver.Log().empty());
+}
+
 TEST_F(ObserverTest, AnExceptionFreesTheLock)
 {
     Add("a").onRelease = [] { throw std::runtime_error("from a"); };

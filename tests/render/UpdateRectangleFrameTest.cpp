@@ -403,7 +403,7 @@ TEST(UpdateRectangleFrame, SubBufferModePostsTheDamage)
                                                     window.surface->Get(), 100, 200, 200, 60)}));
 }
 
-TEST(UpdateRectangleFrame, RefusedSubBufferIsFalse)
+TEST(UpdateRectangleFrame, RefusedSubBufferIsFalseAndLogged)
 {
     UpdateWindow window(PlainDevice().WithPostSubBuffer());
     const auto rectangle = window.Rectangle();
@@ -412,6 +412,9 @@ TEST(UpdateRectangleFrame, RefusedSubBufferIsFalse)
     EXPECT_FALSE(rectangle->DoSwapBuffers());
 
     EXPECT_EQ(window.driver.CallCount("eglSwapBuffers"), 0u);
+    EXPECT_TRUE(window.driver.HasLog(ANDROID_LOG_ERROR,
+                                     "bool Nib::UpdateRectangle::DoSwapBuffers() Failed. "
+                                     "Err = 12301"));
 }
 
 TEST(UpdateRectangleFrame, DamageModeSwapsWithTheDamage)
@@ -442,7 +445,7 @@ TEST(UpdateRectangleFrame, DamageIsEmptyUntilItIsFilled)
               (std::vector<long long>{0, 0, 0, 0}));
 }
 
-TEST(UpdateRectangleFrame, RefusedDamageSwapIsFalse)
+TEST(UpdateRectangleFrame, RefusedDamageSwapIsFalseAndLogged)
 {
     UpdateWindow window(DamageDevice());
     const auto rectangle = window.Rectangle();
@@ -451,6 +454,9 @@ TEST(UpdateRectangleFrame, RefusedDamageSwapIsFalse)
     EXPECT_FALSE(rectangle->DoSwapBuffers());
 
     EXPECT_EQ(window.driver.CallCount("eglSwapBuffers"), 0u);
+    EXPECT_TRUE(window.driver.HasLog(ANDROID_LOG_ERROR,
+                                     "bool Nib::UpdateRectangle::DoSwapBuffers() Failed. "
+                                     "Err = 12301"));
 }
 
 TEST(UpdateRectangleFrame, DamageModeWithoutTheDamageSwapSwapsAll)

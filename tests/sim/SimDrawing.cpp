@@ -1,5 +1,6 @@
 #include "SimEgl.h"
 #include "SimGl.h"
+#include "SimPicture.h"
 
 #include <cstring>
 
@@ -220,6 +221,7 @@ SIM_API void glReadPixels(GLint x, GLint y, GLsizei width, GLsizei height, GLenu
         return entry.Misuse(GL_INVALID_OPERATION,
                             "the image cannot be read as " + Hex(format) + ", " + Hex(type));
     Download(entry, *image, {x, y, width, height}, {format, type}, pixels);
+    NotePicture(entry.state, "read", *image, {x, y, width, height});
 }
 
 SIM_API void glBlitFramebuffer(GLint srcX0, GLint srcY0, GLint srcX1, GLint srcY1, GLint dstX0,
@@ -240,6 +242,7 @@ SIM_API void glBlitFramebuffer(GLint srcX0, GLint srcY0, GLint srcX1, GLint srcY
         const Box wanted{std::min(dstX0, dstX1), std::min(dstY0, dstY1), std::abs(dstX1 - dstX0),
                          std::abs(dstY1 - dstY0)};
         const Box area = Intersection(wanted, DrawArea(entry.Gl(), *image));
+        image->drawn = CopiedInto(*image, from, area);
         for (int y = area.y; y < area.y + area.height; ++y)
         {
             for (int x = area.x; x < area.x + area.width; ++x)

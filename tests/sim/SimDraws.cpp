@@ -1,4 +1,5 @@
 #include "SimGl.h"
+#include "SimPicture.h"
 
 // Draw calls: checked, and recorded with the state that they use. Nothing is rasterised.
 
@@ -107,16 +108,34 @@ SimDraw Describe(GlEntry& entry, const Request& request, const VertexArray& arra
     return draw;
 }
 
+void DrawInto(const std::vector<Image*>& images, std::uint64_t draw)
+{
+    for (Image* const image : images)
+    {
+        Digest digest;
+        digest.Add(image->drawn);
+        digest.Add(draw);
+        image->drawn = digest.Value();
+    }
+}
+
 void Draw(GlEntry& entry, const Request& request)
 {
-    if (!entry || !CheckRequest(entry, request) || !DrawImages(entry))
+    const std::optional<std::vector<Image*>> images =
+        entry && CheckRequest(entry, request) ? DrawImages(entry) : std::nullopt;
+    if (!images)
         return;
     const VertexArray& array = CurrentVertexArray(entry.Gl());
     CheckAttribs(entry, array);
     if (request.indexType != 0)
         CheckIndices(entry, request, array);
+    if (!entry.state.recording && !entry.state.notesPictures)
+        return;
+    SimDraw draw = Describe(entry, request, array);
+    if (entry.state.notesPictures)
+        DrawInto(*images, DigestOfDraw(entry, draw));
     if (entry.state.recording)
-        entry.state.draws.push_back(Describe(entry, request, array));
+        entry.state.draws.push_back(std::move(draw));
 }
 
 } // namespace

@@ -179,6 +179,11 @@ void SimDriver::FailAt(std::size_t n, unsigned eglError, unsigned glError)
     state->failAtGlError = glError;
 }
 
+void SimDriver::LoseContextsAt(std::size_t n)
+{
+    Locked()->loseContextsAt = n;
+}
+
 std::size_t SimDriver::CallsMade() const
 {
     return Locked()->callsMade;
@@ -189,6 +194,7 @@ void SimDriver::ForgetFailures()
     Locked state;
     state->failures.clear();
     state->failAt = 0;
+    state->loseContextsAt = 0;
     state->compileFailures.clear();
     state->linkFailures.clear();
 }

@@ -104,6 +104,10 @@ public:
     /// Refuses the call number @p n (from 1) since ForgetCalls or the start, whatever it is.
     void FailAt(std::size_t n, unsigned eglError = EGL_BAD_ALLOC,
                 unsigned glError = GL_OUT_OF_MEMORY);
+    /// All contexts that exist at the call number @p n are lost, as after a reset of the GPU: GL
+    /// calls do nothing, they cannot become current, their surfaces cannot be presented, and what
+    /// shares with them is lost, too.
+    void LoseContextsAt(std::size_t n);
     /// Calls since ForgetCalls or the start, counted also while recording is off.
     std::size_t CallsMade() const;
     /// Takes back all failures that have not happened yet.
@@ -210,6 +214,13 @@ public:
     std::vector<EGLSurface> Surfaces() const;
     /// Draw calls with their attributes, since the start or ForgetCalls.
     std::vector<SimDraw> Draws() const;
+
+    // ---- pictures
+    // -----------------------------------------------------------------------------------
+    /// Switches off or on that images keep account of the draws into them.
+    void NotePictures(bool on);
+    /// What was presented and read back since, in order.
+    std::vector<SimPicture> Pictures() const;
 };
 
 /// A context that a test makes for itself, current on the calling thread on a 1 x 1 pbuffer. Its

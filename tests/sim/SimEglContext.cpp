@@ -1,4 +1,5 @@
 #include "SimEgl.h"
+#include "SimPrograms.h"
 
 // Contexts: creation, the current one of each thread, destruction.
 
@@ -113,6 +114,11 @@ void BuryContext(State& state, Context& context)
 {
     if (!context.destroyed || context.thread != 0)
         return;
+    if (Program* const used = context.group->programs.Find(context.gl.program))
+    {
+        --used->uses;
+        BuryProgram(*context.group, context.gl.program);
+    }
     CountLost(state.lost, context);
     state.contexts.erase(context.handle);
 }
@@ -234,6 +240,8 @@ SIM_API EGLBoolean eglMakeCurrent(EGLDisplay display, EGLSurface draw, EGLSurfac
         return EGL_FALSE;
     if (context->thread != 0 && context->thread != thread.number)
         return entry.Misuse(EGL_BAD_ACCESS, "the context is current on another thread");
+    if (context->group->lost)
+        return entry.Refuse(EGL_CONTEXT_LOST);
     Surface* drawSurface = nullptr;
     Surface* readSurface = nullptr;
     if (draw == EGL_NO_SURFACE && read == EGL_NO_SURFACE)

@@ -20,8 +20,8 @@ Entry::Entry(Api api, const char* name, std::initializer_list<SimValue> args)
         return;
     RunAction();
     WaitWhileHeld();
-    if (api != Api::Platform)
-        ++state.callsMade;
+    if (api != Api::Platform && ++state.callsMade == state.loseContextsAt)
+        LoseContexts();
     Record(args);
     m_refused = TakeFailure(api, args);
     if (m_record)
@@ -67,6 +67,12 @@ void Entry::Record(std::initializer_list<SimValue> args)
     call.context = m_thread->context ? m_thread->context->handle : nullptr;
     state.calls.push_back(std::move(call));
     m_record = &state.calls.back();
+}
+
+void Entry::LoseContexts()
+{
+    for (const auto& [handle, context] : state.contexts)
+        context->group->lost = true;
 }
 
 bool Entry::TakeFailure(Api api, std::initializer_list<SimValue> args)
@@ -142,6 +148,10 @@ GlEntry::GlEntry(const char* name, std::initializer_list<SimValue> args, int ver
     else if (m_refused)
     {
         SetError(m_error);
+    }
+    else if (Group().lost)
+    {
+        m_refused = true;
     }
     else if (Version() < version)
     {

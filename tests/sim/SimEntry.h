@@ -67,6 +67,7 @@ private:
     void NoteBlocked(int change);
     void RunAction();
     void WaitWhileHeld();
+    void LoseContexts();
     bool TakeFailure(Api api, std::initializer_list<SimValue> args);
     void Record(std::initializer_list<SimValue> args);
 

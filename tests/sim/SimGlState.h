@@ -190,6 +190,7 @@ struct ShareGroup
     NameTable<Shader> shaders;
     GLuint lastProgramName = 0; // of either kind
     std::map<GLsync, Sync> syncs;
+    bool lost = false; // its contexts do nothing any more
 };
 
 struct StencilFace

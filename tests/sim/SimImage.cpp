@@ -1,5 +1,7 @@
 #include "SimImage.h"
 
+#include "SimPicture.h"
+
 #include <algorithm>
 #include <cstring>
 
@@ -27,6 +29,7 @@ void Image::Fill(const Color& color)
 {
     m_bytes.clear();
     m_bytes.shrink_to_fit();
+    drawn = 0;
     EncodePixel(layout, color, m_fill.data());
 }
 
@@ -99,8 +102,10 @@ void Image::CopyFrom(const Image& source, const Box& area)
     {
         m_bytes = source.m_bytes;
         m_fill = source.m_fill;
+        drawn = source.drawn;
         return;
     }
+    drawn = Sim::CopiedInto(*this, source, inside);
     for (int y = inside.y; y < inside.y + inside.height; ++y)
     {
         for (int x = inside.x; x < inside.x + inside.width; ++x)

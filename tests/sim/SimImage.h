@@ -7,6 +7,7 @@
 
 #include <array>
 #include <cstddef>
+#include <cstdint>
 #include <vector>
 
 namespace Sim
@@ -52,6 +53,7 @@ public:
     int depth = 1;
     GLenum internalFormat = 0;
     PixelFormat layout;
+    std::uint64_t drawn = 0; ///< stands for the draws that went into it; 0 for none
 
     bool Exists() const { return internalFormat != 0; }
     Box Area() const { return {0, 0, width, height}; }

@@ -59,9 +59,11 @@ SimCounts SimDriver::Live() const
     counts.surfaces = static_cast<int>(state.surfaces.size());
     counts.eglSyncs = static_cast<int>(state.eglSyncs.size());
     for (const auto& [handle, context] : state.contexts)
-        counts.framebuffers += context->gl.framebuffers.Count();
+        counts.framebuffers += context->group->lost ? 0 : context->gl.framebuffers.Count();
     for (const ShareGroup* group : Groups(state))
     {
+        if (group->lost)
+            continue; // so are its objects
         counts.textures += group->textures.Count();
         counts.samplers += group->samplers.Count();
         counts.buffers += group->buffers.Count();

@@ -4,6 +4,7 @@
 #include <EGL/egl.h>
 #include <GLES3/gl3.h>
 
+#include <cstdint>
 #include <iosfwd>
 #include <map>
 #include <string>
@@ -201,6 +202,17 @@ struct SimDraw
     int scissor[4] = {};
     int viewport[4] = {};
     unsigned thread = 0;
+};
+
+/// What became visible in a window, or was read back, as a number: the same in two runs that
+/// cleared, uploaded, drew and copied the same.
+struct SimPicture
+{
+    std::string where; ///< "window" or "read"
+    std::uint64_t digest = 0;
+    int area[4] = {}; ///< the part that was shown or read: x, y, width, height
+
+    friend bool operator==(const SimPicture&, const SimPicture&) = default;
 };
 
 #endif

@@ -1,4 +1,5 @@
 #include "SimEgl.h"
+#include "SimPicture.h"
 
 #include <algorithm>
 
@@ -77,6 +78,24 @@ void FollowWindowSize(State& state, Surface& surface, NativeWindow& window)
     surface.age = 0;
 }
 
+/// The area of a damaged swap as one box; without damage all of the image.
+Box Bounds(const std::vector<Box>& damage, const Image& image)
+{
+    if (damage.empty())
+        return image.Area();
+    Box all = damage.front();
+    for (const Box& box : damage)
+    {
+        const int right = std::max(all.x + all.width, box.x + box.width);
+        const int top = std::max(all.y + all.height, box.y + box.height);
+        all.x = std::min(all.x, box.x);
+        all.y = std::min(all.y, box.y);
+        all.width = right - all.x;
+        all.height = top - all.y;
+    }
+    return all;
+}
+
 } // namespace
 
 Color Undefined(const State& state)
@@ -136,7 +155,10 @@ void ShowFrontBuffer(State& state, Surface& surface)
 {
     NativeWindow* const window = WindowOf(state, surface);
     if (window && surface.activeRenderBuffer == EGL_SINGLE_BUFFER && surface.autoRefresh)
+    {
         ++window->presented;
+        NotePicture(state, "window", window->front, window->front.Area());
+    }
 }
 
 void PresentFrame(State& state, Surface& surface, const std::vector<Box>& damage)
@@ -148,6 +170,7 @@ void PresentFrame(State& state, Surface& surface, const std::vector<Box>& damage
     if (&drawn != &window->front)
         Show(*window, drawn, state.swapChain.damageIsAHint ? std::vector<Box>() : damage);
     ++window->presented;
+    NotePicture(state, "window", drawn, Bounds(damage, drawn));
     ++surface.frameCount;
     ++surface.nextFrameId;
     surface.activeRenderBuffer = surface.renderBuffer;
@@ -171,6 +194,7 @@ void PresentRegion(State& state, Surface& surface, const Box& region)
     window->front.CopyFrom(surface.back, Intersection(region, surface.back.Area()));
     window->lastDamage = {region.x, region.y, region.width, region.height};
     ++window->presented;
+    NotePicture(state, "window", surface.back, region);
     ++surface.nextFrameId;
     surface.clearedTiles.clear();
 }
@@ -195,6 +219,11 @@ Surface* PresentableSurface(EglEntry& entry, EGLSurface handle)
     if (entry.CallingThread().draw != surface)
     {
         entry.Misuse(EGL_BAD_SURFACE, "the surface is not current on this thread");
+        return nullptr;
+    }
+    if (entry.CallingThread().context->group->lost)
+    {
+        entry.Refuse(EGL_CONTEXT_LOST);
         return nullptr;
     }
     if (surface->window && entry.state.windows.at(surface->window)->abandoned)

@@ -110,11 +110,14 @@ struct StateData
     std::vector<SimCall> calls;
     std::size_t callsMade = 0;
     std::vector<SimDraw> draws;
+    bool notesPictures = false;
+    std::vector<SimPicture> pictures;
 
     std::vector<Failure> failures;
     std::size_t failAt = 0;
     unsigned failAtEglError = 0;
     unsigned failAtGlError = 0;
+    std::size_t loseContextsAt = 0;
     std::map<GLenum, std::optional<std::string>> glStrings;
     int configsCounted = -1;
     int configsGiven = -1;

@@ -1,4 +1,5 @@
 #include "SimGl.h"
+#include "SimPicture.h"
 
 #include <cstring>
 
@@ -192,6 +193,7 @@ void UpdateImage(GlEntry& entry, const Place& place, const Region& region,
 /// Copies from the framebuffer; pixels outside of it stay as they are.
 void CopyPixels(const Image& source, GLint x, GLint y, Image& target, const Region& region)
 {
+    target.drawn = CopiedInto(target, source, {x, y, region.width, region.height});
     for (GLsizei row = 0; row < region.height; ++row)
     {
         for (GLsizei column = 0; column < region.width; ++column)

@@ -1,0 +1,136 @@
+#include "faults/DrawingLife.h"
+
+#include <exception>
+
+using namespace Nib;
+
+namespace
+{
+
+class CallTask : public ITask
+{
+public:
+    explicit CallTask(std::function<void()> call) : m_call(std::move(call)) {}
+    void run() override { m_call(); }
+
+private:
+    std::function<void()> m_call;
+};
+
+} // namespace
+
+void DrawingLife::Live()
+{
+    m_surface.reset(RendererFactory::CreateSurfaceRenderer("screen", RenderThreadGL::Medium));
+    if (!m_surface->Start())
+        Note("not started");
+    ShowWindow(40, 60);
+    OnThread(*m_surface, [this] { m_onScreen.Make(); });
+    DrawFrame(0.25f, RectF{0, 0, 40, 60});
+    DrawFrame(0.5f, RectF{10, 10, 20, 30});
+    StartChild();
+    ExportOnChild(0.125f);
+    PauseAndResumeChild();
+    ExportOnChild(0.375f);
+    m_surface->OnSurfaceDestroyed();
+    DrawFrame(0.625f, RectF{0, 0, 40, 60}); // nobody sees it
+    ShowWindow(60, 40);
+    DrawFrame(0.75f, RectF{0, 0, 60, 40});
+    DrawFrame(0.875f, RectF{5, 5, 55, 20});
+    End();
+}
+
+void DrawingLife::ShowWindow(int width, int height)
+{
+    m_width = width;
+    m_height = height;
+    m_surface->OnSurfaceChanged(m_driver.Window(width, height), width, height, 1);
+}
+
+void DrawingLife::DrawFrame(float shade, const RectF& changed)
+{
+    m_surface->ApplyUpdateRect(changed, 0);
+    OnThread(*m_surface,
+             [this, shade]
+             {
+                 const Made<IRenderTarget> screen(
+                     RendererFactory::CreateRenderTargetFromDefault(m_width, m_height));
+                 m_onScreen.DrawOffscreen(shade);
+                 m_onScreen.DrawOn(*screen, shade);
+             });
+    if (!m_surface->Render())
+        Note("not rendered");
+}
+
+void DrawingLife::StartChild()
+{
+    m_child.reset(
+        RendererFactory::CreateOffscreenRenderer(m_surface->GetMsgQueue(), "pages", true));
+    if (!m_child->Start())
+        Note("child not started");
+    OnThread(*m_child, [this] { m_offScreen.Make(); });
+}
+
+void DrawingLife::PauseAndResumeChild()
+{
+    OnThread(*m_child, [this] { m_offScreen.ReleaseUnmanaged(); });
+    m_child->OnPause();
+    m_child->OnResume();
+    OnThread(*m_child, [this] { m_offScreen.Refill(); });
+}
+
+void DrawingLife::ExportOnChild(float shade)
+{
+    OnThread(*m_child,
+             [this, shade]
+             {
+                 m_offScreen.DrawOffscreen(shade);
+                 m_offScreen.Export();
+             });
+}
+
+void DrawingLife::End()
+{
+    EndOnThread(*m_child, m_offScreen);
+    m_child.reset();
+    EndOnThread(*m_surface, m_onScreen);
+    m_surface->OnSurfaceDestroyed();
+    m_surface.reset();
+}
+
+void DrawingLife::OnThread(RenderThreadGL& thread, std::function<void()> work)
+{
+    PostAndWait(thread,
+                [this, work = std::move(work)]
+                {
+                    if (RendererFactory::GetContextHolder()->GetCurrentContextId())
+                        work();
+                    else
+                        Note("no context");
+                });
+}
+
+void DrawingLife::EndOnThread(RenderThreadGL& thread, DrawnThings& things)
+{
+    PostAndWait(thread, [&things] { things.Release(); }); // also where there is no context
+}
+
+void DrawingLife::PostAndWait(RenderThreadGL& thread, std::function<void()> work)
+{
+    const auto guarded = [this, work = std::move(work)]
+    {
+        try
+        {
+            work();
+        }
+        catch (const std::exception& failure)
+        {
+            Note(failure.what());
+        }
+    };
+    IGLMsgQueue* const queue = thread.GetMsgQueue();
+    if (!queue->enQueueMsg(new CallTask(guarded)))
+        Note("not queued");
+    if (!queue->waitForCompleting())
+        Note("not waited for");
+}
