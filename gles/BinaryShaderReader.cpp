@@ -26,9 +26,8 @@ void ReportAttributeCount(const char* function, std::uint64_t expected, std::siz
 
 } // namespace
 
-BinaryShaderReader::BinaryShaderReader(File& file, const char* path, const char* function)
-    : m_file(file), m_path(path), m_function(function),
-      m_shader(std::make_unique<ShaderProgramCache::BinaryShader>())
+BinaryShaderReader::BinaryShaderReader(File& file)
+    : m_file(file), m_shader(std::make_unique<ShaderProgramCache::BinaryShader>())
 {
     errno = 0; // a file that is merely too short sets none
 }
@@ -41,22 +40,20 @@ std::unique_ptr<ShaderProgramCache::BinaryShader> BinaryShaderReader::Read()
     return std::move(m_shader);
 }
 
+bool BinaryShaderReader::Fail(ShaderFileFault fault)
+{
+    m_errno = errno;
+    m_fault = fault;
+    return false;
+}
+
 bool BinaryShaderReader::ReadHeader()
 {
     if (m_file.Read(&m_header, 1, sizeof m_header) != sizeof m_header ||
         m_header.magic != kBinaryShaderMagic || m_header.programLength == 0)
-    {
-        NIB_LOG_ERROR("%s File header read error Err=%d, File = %s", m_function, errno, m_path);
-        return false;
-    }
+        return Fail(ShaderFileFault::Header);
     if (m_header.programLength > kLongestProgram || m_header.attributeSize > kLargestAttributes)
-    {
-        NIB_LOG_ERROR("%s Program size (%lu) OR Attribute size (%lu) is too big to allocate "
-                      "memory. File = %s",
-                      m_function, static_cast<unsigned long>(m_header.programLength),
-                      static_cast<unsigned long>(m_header.attributeSize), m_path);
-        return false;
-    }
+        return Fail(ShaderFileFault::Size);
     m_crc = ContinueCrc(0, &m_header, sizeof m_header);
     return true;
 }
@@ -67,10 +64,7 @@ bool BinaryShaderReader::ReadProgram()
     m_shader->bytes = new unsigned char[length];
     m_shader->length = static_cast<std::int32_t>(length);
     if (m_file.Read(m_shader->bytes, 1, length) != length)
-    {
-        NIB_LOG_ERROR("%s File shader bin read error Err=%d, File = %s", m_function, errno, m_path);
-        return false;
-    }
+        return Fail(ShaderFileFault::Program);
     m_crc = ContinueCrc(m_crc, m_shader->bytes, length);
     return true;
 }
@@ -81,33 +75,53 @@ bool BinaryShaderReader::ReadAttributes()
         return true; // the number of names is then not looked at
     std::vector<unsigned char> block(static_cast<std::size_t>(m_header.attributeSize));
     if (m_file.Read(block.data(), 1, block.size()) != block.size())
-    {
-        NIB_LOG_ERROR("%s File attribs read error Err=%d, File = %s", m_function, errno, m_path);
-        return false;
-    }
+        return Fail(ShaderFileFault::Attributes);
     m_crc = ContinueCrc(m_crc, block.data(), block.size());
     const bool isParsed = ShaderProgramCache::ParseShaderAttributes(
         block.data(), static_cast<unsigned int>(block.size()), m_shader->attributes);
     if (isParsed && m_shader->attributes.size() == m_header.attributeCount)
         return true;
-    ReportAttributeCount(m_function, m_header.attributeCount, m_shader->attributes.size());
-    return false;
+    return Fail(ShaderFileFault::Names);
 }
 
 bool BinaryShaderReader::CheckSum()
 {
-    std::uint64_t stored = 0;
-    if (m_file.Read(&stored, sizeof stored, 1) != 1)
+    if (m_file.Read(&m_storedCrc, sizeof m_storedCrc, 1) != 1)
+        return Fail(ShaderFileFault::NoSum);
+    return m_storedCrc == m_crc || Fail(ShaderFileFault::Sum);
+}
+
+void BinaryShaderReader::LogFault(const char* path, const char* function) const
+{
+    switch (m_fault)
     {
-        NIB_LOG_ERROR("%s Filed to read CRC from file. Err=%d, File = %s", m_function, errno,
-                      m_path);
-        return false;
+    case ShaderFileFault::None: break;
+    case ShaderFileFault::Header:
+        NIB_LOG_ERROR("%s File header read error Err=%d, File = %s", function, m_errno, path);
+        break;
+    case ShaderFileFault::Size:
+        NIB_LOG_ERROR("%s Program size (%lu) OR Attribute size (%lu) is too big to allocate "
+                      "memory. File = %s",
+                      function, static_cast<unsigned long>(m_header.programLength),
+                      static_cast<unsigned long>(m_header.attributeSize), path);
+        break;
+    case ShaderFileFault::Program:
+        NIB_LOG_ERROR("%s File shader bin read error Err=%d, File = %s", function, m_errno, path);
+        break;
+    case ShaderFileFault::Attributes:
+        NIB_LOG_ERROR("%s File attribs read error Err=%d, File = %s", function, m_errno, path);
+        break;
+    case ShaderFileFault::Names:
+        ReportAttributeCount(function, m_header.attributeCount, m_shader->attributes.size());
+        break;
+    case ShaderFileFault::NoSum:
+        NIB_LOG_ERROR("%s Filed to read CRC from file. Err=%d, File = %s", function, m_errno, path);
+        break;
+    case ShaderFileFault::Sum:
+        NIB_LOG_ERROR("%s Invalid CRC, From file: %lu, Calculated: = %lu", function,
+                      static_cast<unsigned long>(m_storedCrc), static_cast<unsigned long>(m_crc));
+        break;
     }
-    if (stored == m_crc)
-        return true;
-    NIB_LOG_ERROR("%s Invalid CRC, From file: %lu, Calculated: = %lu", m_function,
-                  static_cast<unsigned long>(stored), static_cast<unsigned long>(m_crc));
-    return false;
 }
 
 } // namespace Nib

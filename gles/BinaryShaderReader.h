@@ -8,32 +8,52 @@
 namespace Nib
 {
 
+/// What keeps a binary shader file from being whole; the first of them.
+enum class ShaderFileFault
+{
+    None,
+    Header,     ///< cut short, another magic, or no program
+    Size,       ///< a program or names larger than any that is read
+    Program,    ///< cut short
+    Attributes, ///< cut short
+    Names,      ///< not as many as the header says, or the last one without its end
+    NoSum,      ///< cut short
+    Sum,        ///< another one than that of the bytes
+};
+
 /// Reads one binary shader file from its beginning to its end, and believes nothing in it before it
-/// was checked: sizes before memory is taken, the sum before the record is handed out. Each step
-/// that fails writes its own ERROR line.
+/// was checked: sizes before memory is taken, the sum before the record is handed out.
 class BinaryShaderReader
 {
 public:
-    /// @param file      open at its beginning
-    /// @param path      names the file in the log
-    /// @param function  the signature that the log lines carry
-    BinaryShaderReader(File& file, const char* path, const char* function);
+    /// @param file  open at its beginning
+    explicit BinaryShaderReader(File& file);
 
     /// The record, without its key; null when the file is not whole.
     std::unique_ptr<ShaderProgramCache::BinaryShader> Read();
+
+    /// Of a Read that gave nothing.
+    ShaderFileFault Fault() const { return m_fault; }
+
+    /// Writes the ERROR line of that fault.
+    /// @param path      names the file
+    /// @param function  the signature that the line carries
+    void LogFault(const char* path, const char* function) const;
 
 private:
     bool ReadHeader();
     bool ReadProgram();
     bool ReadAttributes();
     bool CheckSum();
+    bool Fail(ShaderFileFault fault);
 
     File& m_file;
-    const char* const m_path;
-    const char* const m_function;
     BinaryShaderHeader m_header{};
     std::uint64_t m_crc = 0;
+    std::uint64_t m_storedCrc = 0;
     std::unique_ptr<ShaderProgramCache::BinaryShader> m_shader;
+    ShaderFileFault m_fault = ShaderFileFault::None;
+    int m_errno = 0; ///< at the fault
 };
 
 } // namespace Nib

@@ -1,15 +1,14 @@
 #include "base/Log.h"
 #include "gles/BinaryShaderFile.h"
 #include "gles/BinaryShaderReader.h"
+#include "gles/CacheFileNames.h"
 #include "gles/SymbolicLink.h"
-#include "gles/TemporaryFiles.h"
 
 #include <nib/shader_cache.h>
 
 #include <algorithm>
 #include <atomic>
 #include <cerrno>
-#include <cstdio>
 #include <cstring>
 #include <utility>
 
@@ -220,9 +219,7 @@ bool ShaderProgramCache::SetBinaryShader(const BinaryShader& shader)
 
 std::string ShaderProgramCache::GetFileName(BinaryShaderKey key) const
 {
-    char name[128];
-    std::snprintf(name, sizeof name, "/sh%0lu.dat", static_cast<unsigned long>(key));
-    return m_cacheDirectory + name;
+    return m_cacheDirectory + "/" + ShaderFileName(key);
 }
 
 /// False, with an errno, without a folder, where names would be the root's, and when somebody has
@@ -291,10 +288,61 @@ ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderK
                       path);
         return nullptr;
     }
-    std::unique_ptr<BinaryShader> shader = BinaryShaderReader(file, path, function).Read();
+    BinaryShaderReader reader(file);
+    std::unique_ptr<BinaryShader> shader = reader.Read();
     if (shader)
         shader->key = key;
+    else
+        reader.LogFault(path, function);
     return shader.release();
+}
+
+// ---- files, as tools see them -------------------------------------------------------------------
+
+namespace
+{
+
+const char* TextOf(ShaderFileFault fault)
+{
+    switch (fault)
+    {
+    case ShaderFileFault::None: break;
+    case ShaderFileFault::Header: return "no header of a shader file";
+    case ShaderFileFault::Size: return "sizes beyond what is read";
+    case ShaderFileFault::Program: return "cut short in the program";
+    case ShaderFileFault::Attributes: return "cut short in the attribute names";
+    case ShaderFileFault::Names: return "attribute names that do not match their number";
+    case ShaderFileFault::NoSum: return "cut short before the checksum";
+    case ShaderFileFault::Sum: return "a wrong checksum";
+    }
+    return "";
+}
+
+} // namespace
+
+ShaderProgramCache::FileKind ShaderProgramCache::GetFileKind(const char* name)
+{
+    if (KeyInFileName(name))
+        return FileKind::Program;
+    if (!IsTemporaryName(name))
+        return FileKind::Foreign;
+    return IsStaleTemporary(name) ? FileKind::Leftover : FileKind::BeingWritten;
+}
+
+std::string ShaderProgramCache::CheckFile(const char* path, BinaryShader* out)
+{
+    String filePath;
+    filePath.Construct(path);
+    File file;
+    if (!file.Construct(&filePath, "rbn", false))
+        return std::string("cannot be opened: ") + std::strerror(errno);
+    BinaryShaderReader reader(file);
+    std::unique_ptr<BinaryShader> shader = reader.Read();
+    if (!shader)
+        return TextOf(reader.Fault());
+    if (out != nullptr)
+        *out = std::move(*shader);
+    return "";
 }
 
 bool ShaderProgramCache::ParseShaderAttributes(const unsigned char* data, unsigned int size,

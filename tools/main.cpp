@@ -1,3 +1,4 @@
+#include "CacheCommand.h"
 #include "DrawCommand.h"
 #include "Drawing.h"
 #include "InfoCommand.h"
@@ -45,6 +46,7 @@ int main(int argc, char** argv)
     AddDrawCommand(app, &Draw);
     AddInfoCommand(app);
     AddLatencyCommand(app);
+    AddCacheCommand(app);
     try
     {
         app.parse(argc, argv);
@@ -56,6 +58,10 @@ int main(int argc, char** argv)
     catch (const CLI::CallForVersion& version)
     {
         return app.exit(version);
+    }
+    catch (const CLI::RuntimeError& result) // the command has told already what there is to tell
+    {
+        return result.get_exit_code();
     }
     catch (const CLI::ParseError& failure)
     {

@@ -86,6 +86,23 @@ public:
     static bool ParseShaderAttributes(const unsigned char* data, unsigned int size,
                                       std::vector<std::string>& out);
 
+    /// What a name in a cache folder stands for.
+    enum class FileKind
+    {
+        Foreign,      ///< nothing of the cache's
+        Program,      ///< a binary shader file
+        BeingWritten, ///< a binary shader file that a living process writes under another name
+        Leftover,     ///< the same of a process that has ended; the next start removes it
+    };
+
+    /// For tools. @p name without the folder.
+    static FileKind GetFileKind(const char* name);
+
+    /// For tools: reads a file as a look-up would, past the cache and without a log line.
+    /// @param out  receives the record, without its key, when the file is whole; may be null
+    /// @return what keeps the file from being loaded, in words; empty when it is whole
+    static std::string CheckFile(const char* path, BinaryShader* out);
+
 private:
     ShaderProgramCache();
 

@@ -1,24 +1,15 @@
 #include "faults/FaultVerdict.h"
+#include "faults/Stride.h"
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
-#include <cstdlib>
 #include <iostream>
-#include <numeric>
 
 // One life of an application, again and again, each time with another call of the driver refused,
 // or with all contexts lost at another call.
 
 namespace
 {
-
-/// Every how many-th call a run is made for: NIB_FAULT_STRIDE, else all of them.
-std::size_t Stride()
-{
-    const char* const text = std::getenv("NIB_FAULT_STRIDE");
-    return text ? std::max(std::strtoul(text, nullptr, 10), 1ul) : 1;
-}
 
 struct Account
 {

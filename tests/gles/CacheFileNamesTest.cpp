@@ -1,4 +1,4 @@
-#include "gles/TemporaryFiles.h"
+#include "gles/CacheFileNames.h"
 #include "gles/CacheFiles.h"
 #include "sim/SimDriver.h"
 
@@ -24,10 +24,10 @@ std::string EndedProcess()
     return std::to_string(child);
 }
 
-class TemporaryFiles : public testing::Test
+class CacheFileNames : public testing::Test
 {
 protected:
-    TemporaryFiles() { fs::create_directory(cache.Path()); }
+    CacheFileNames() { fs::create_directory(cache.Path()); }
 
     void Leave(const std::string& name) { WriteBytes(cache.File(name), Bytes{'x'}); }
 
@@ -37,7 +37,7 @@ protected:
 
 } // namespace
 
-TEST_F(TemporaryFiles, OfAnEndedProcessAreRemovedAtTheStartOfTheCache)
+TEST_F(CacheFileNames, OfAnEndedProcessAreRemovedAtTheStartOfTheCache)
 {
     Leave("sh5.dat");
     Leave("sh5.dat." + EndedProcess() + ".0.tmp");
@@ -49,7 +49,7 @@ TEST_F(TemporaryFiles, OfAnEndedProcessAreRemovedAtTheStartOfTheCache)
     EXPECT_EQ(driver.Log().size(), 0u);
 }
 
-TEST_F(TemporaryFiles, OfALivingProcessAreLeftAlone)
+TEST_F(CacheFileNames, OfALivingProcessAreLeftAlone)
 {
     const std::string living = "sh5.dat." + std::to_string(getppid()) + ".0.tmp";
     Leave(living);
@@ -59,7 +59,7 @@ TEST_F(TemporaryFiles, OfALivingProcessAreLeftAlone)
     EXPECT_EQ(cache.Names(), Texts{living});
 }
 
-TEST_F(TemporaryFiles, OfAnEarlierProcessOfTheSameNumberAreRemoved)
+TEST_F(CacheFileNames, OfAnEarlierProcessOfTheSameNumberAreRemoved)
 {
     Leave("sh5.dat." + std::to_string(getpid()) + ".3.tmp");
 
@@ -68,7 +68,7 @@ TEST_F(TemporaryFiles, OfAnEarlierProcessOfTheSameNumberAreRemoved)
     EXPECT_EQ(cache.Names(), Texts{});
 }
 
-TEST_F(TemporaryFiles, FilesOfOtherNamesAreNobodysTemporaries)
+TEST_F(CacheFileNames, FilesOfOtherNamesAreNobodysTemporaries)
 {
     const std::string ended = EndedProcess();
     const Texts others{"notes.tmp",
@@ -87,7 +87,7 @@ TEST_F(TemporaryFiles, FilesOfOtherNamesAreNobodysTemporaries)
     EXPECT_EQ(cache.Names().size(), others.size());
 }
 
-TEST_F(TemporaryFiles, ALinkUnderTheirNameGoesAndNotWhatItPointsTo)
+TEST_F(CacheFileNames, ALinkUnderTheirNameGoesAndNotWhatItPointsTo)
 {
     const TemporaryFolder elsewhere;
     WriteBytes(elsewhere / "victim", Bytes{'v'});
@@ -99,7 +99,7 @@ TEST_F(TemporaryFiles, ALinkUnderTheirNameGoesAndNotWhatItPointsTo)
     EXPECT_EQ(ReadBytes(elsewhere / "victim"), Bytes{'v'});
 }
 
-TEST_F(TemporaryFiles, BehindALinkInPlaceOfTheFolderAreLeftAlone)
+TEST_F(CacheFileNames, BehindALinkInPlaceOfTheFolderAreLeftAlone)
 {
     const TemporaryFolder elsewhere;
     const std::string stale = elsewhere / ("sh5.dat." + EndedProcess() + ".0.tmp");
@@ -112,7 +112,47 @@ TEST_F(TemporaryFiles, BehindALinkInPlaceOfTheFolderAreLeftAlone)
     EXPECT_TRUE(fs::exists(stale));
 }
 
-TEST_F(TemporaryFiles, NoTwoNamesAreAlike)
+TEST_F(CacheFileNames, NoTwoNamesAreAlike)
 {
     EXPECT_NE(Nib::TemporaryName("/c/sh5.dat"), Nib::TemporaryName("/c/sh5.dat"));
+}
+
+TEST(CacheFileNamesKinds, AreToldByTheNameAlone)
+{
+    using Kind = ShaderProgramCache::FileKind;
+    const std::string ended = EndedProcess();
+
+    EXPECT_EQ(ShaderProgramCache::GetFileKind("sh5.dat"), Kind::Program);
+    EXPECT_EQ(ShaderProgramCache::GetFileKind("sh05.dat"), Kind::Foreign);
+    EXPECT_EQ(ShaderProgramCache::GetFileKind("sh5.data"), Kind::Foreign);
+    EXPECT_EQ(ShaderProgramCache::GetFileKind("notes.txt"), Kind::Foreign);
+    EXPECT_EQ(ShaderProgramCache::GetFileKind(("sh5.dat." + ended + ".0.tmp").c_str()),
+              Kind::Leftover);
+    EXPECT_EQ(ShaderProgramCache::GetFileKind(
+                  ("sh5.dat." + std::to_string(getppid()) + ".0.tmp").c_str()),
+              Kind::BeingWritten);
+}
+
+TEST(CacheFileCheck, TellsWhatAFileHoldsOrWhatIsWrongWithIt)
+{
+    const SimDriver driver;
+    const TemporaryFolder folder;
+    const Bytes whole = FileFields::Of("PROGRAM", {"a_pos"}).File();
+    WriteBytes(folder / "whole", whole);
+    WriteBytes(folder / "short", Bytes(whole.begin(), whole.begin() + 43));
+    Bytes flipped = whole;
+    flipped[41] ^= 1;
+    WriteBytes(folder / "flipped", flipped);
+
+    ShaderProgramCache::BinaryShader record;
+    EXPECT_EQ(ShaderProgramCache::CheckFile((folder / "whole").c_str(), &record), "");
+    EXPECT_EQ(ProgramText(record), "PROGRAM");
+    EXPECT_EQ(record.attributes, Texts{"a_pos"});
+    EXPECT_EQ(ShaderProgramCache::CheckFile((folder / "short").c_str(), nullptr),
+              "cut short in the program");
+    EXPECT_EQ(ShaderProgramCache::CheckFile((folder / "flipped").c_str(), nullptr),
+              "a wrong checksum");
+    EXPECT_EQ(ShaderProgramCache::CheckFile((folder / "none").c_str(), nullptr),
+              "cannot be opened: No such file or directory");
+    EXPECT_EQ(driver.Log().size(), 0u);
 }

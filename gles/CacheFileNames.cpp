@@ -1,4 +1,4 @@
-#include "gles/TemporaryFiles.h"
+#include "gles/CacheFileNames.h"
 
 #include "gles/SymbolicLink.h"
 
@@ -21,7 +21,7 @@ namespace
 {
 
 constexpr std::string_view kShaderPrefix = "sh";
-constexpr std::string_view kShaderSuffix = ".dat.";
+constexpr std::string_view kShaderSuffix = ".dat";
 constexpr std::string_view kTemporarySuffix = ".tmp";
 
 // Takes @p text off the front of @p name; false when it does not begin so.
@@ -47,11 +47,19 @@ std::optional<Number> SkipNumber(std::string_view& name)
     return number;
 }
 
+// Takes "sh<KEY>.dat" off the front of @p name.
+std::optional<std::uint64_t> SkipShaderFileName(std::string_view& name)
+{
+    if (!Skip(name, kShaderPrefix))
+        return std::nullopt;
+    const std::optional<std::uint64_t> key = SkipNumber<std::uint64_t>(name);
+    return key && Skip(name, kShaderSuffix) ? key : std::nullopt;
+}
+
 // The process that writes or wrote the file; nothing for a name that is none of TemporaryName's.
 std::optional<pid_t> WriterOf(std::string_view name)
 {
-    if (!Skip(name, kShaderPrefix) || !SkipNumber<unsigned long>(name) ||
-        !Skip(name, kShaderSuffix))
+    if (!SkipShaderFileName(name) || !Skip(name, "."))
         return std::nullopt;
     const std::optional<pid_t> writer = SkipNumber<pid_t>(name);
     if (!writer || *writer == 0 || !Skip(name, ".") || !SkipNumber<unsigned>(name) ||
@@ -72,6 +80,29 @@ struct CloseFolder
 
 } // namespace
 
+std::string ShaderFileName(std::uint64_t key)
+{
+    return std::string(kShaderPrefix) + std::to_string(key) + std::string(kShaderSuffix);
+}
+
+std::optional<std::uint64_t> KeyInFileName(std::string_view name)
+{
+    std::string_view rest = name;
+    const std::optional<std::uint64_t> key = SkipShaderFileName(rest);
+    return key && name == ShaderFileName(*key) ? key : std::nullopt;
+}
+
+bool IsTemporaryName(std::string_view name)
+{
+    return WriterOf(name).has_value();
+}
+
+bool IsStaleTemporary(std::string_view name)
+{
+    const std::optional<pid_t> writer = WriterOf(name);
+    return writer && HasEnded(*writer);
+}
+
 std::string TemporaryName(const std::string& path)
 {
     static std::atomic<unsigned> counter{0};
@@ -87,8 +118,7 @@ void RemoveStaleTemporaries(const std::string& directory)
         return;
     while (const dirent* const entry = readdir(folder.get()))
     {
-        const std::optional<pid_t> writer = WriterOf(entry->d_name);
-        if (writer && HasEnded(*writer))
+        if (IsStaleTemporary(entry->d_name))
             unlinkat(dirfd(folder.get()), entry->d_name, 0); // what stays harms nobody
     }
 }
