@@ -49,7 +49,7 @@ void FillBuffers(int size)
     const auto count = static_cast<unsigned int>(size);
     const Ink::Owned<Nib::IGraphicsObject> mesh(RendererFactory::CreateGraphicsObject(
         1, Nib::PrimitiveType::Triangles, &vertex, count, count));
-    const std::vector<float> vertices(static_cast<std::size_t>(size) * 3);
+    const std::vector<float> vertices(static_cast<std::size_t>(size) * 3 + 4); // 16 bytes at least
     const std::vector<std::uint32_t> indexes(static_cast<std::size_t>(size));
     mesh->UpdateBuffer(0, vertices.data(), count);
     mesh->UpdateIndexes(indexes.data(), count);
