@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdio>
+#include <cstdlib>
 #include <thread>
 
 using Nib::EglContext;
@@ -163,6 +164,20 @@ TEST(SharedContext, IsDestroyedWhenTheProcessEnds)
             std::exit(0);
         },
         testing::ExitedWithCode(0), "it is gone");
+}
+
+TEST(SharedContext, IsDestroyedBeforeWhatTheDriverSetUpForItsOwnEnd)
+{
+    EXPECT_EXIT(
+        {
+            SimDriver driver;
+            driver.OnCall("eglInitialize", []
+                          { std::atexit([] { std::fputs("the driver has ended\n", stderr); }); });
+            driver.OnCall("eglDestroyContext", [] { std::fputs("it is gone\n", stderr); });
+            SharedContext::GetInstance();
+            std::exit(0);
+        },
+        testing::ExitedWithCode(0), "it is gone\nthe driver has ended");
 }
 
 TEST(SharedContext, NothingIsMadeWhenTheProcessEndsWithoutOne)
