@@ -5,6 +5,7 @@ option(NIB_BUILD_EXAMPLES "Build the examples" ${PROJECT_IS_TOP_LEVEL})
 option(NIB_BUILD_BENCH "Build the benchmarks" OFF)
 option(NIB_BUILD_FUZZERS "Build the fuzzers (Clang only)" OFF)
 option(NIB_INSTALL "Generate install rules" ${PROJECT_IS_TOP_LEVEL})
+option(NIB_TEST_ALL_DRIVERS "Test further EGL drivers, those that docs/drivers.md lists" OFF)
 option(NIB_WERROR "Treat warnings as errors" ON)
 set(NIB_SANITIZE "" CACHE STRING "Sanitizers to build with: address,undefined or thread")
 

@@ -1,17 +1,19 @@
 #ifndef NIB_TESTS_DRIVERS_DRIVERCONTEXT_H
 #define NIB_TESTS_DRIVERS_DRIVERCONTEXT_H
 
+#include "drivers/Driver.h"
+#include "drivers/WaylandWindow.h"
+
 #include <EGL/egl.h>
 #include <GLES3/gl31.h>
 
 #include <gtest/gtest.h>
 
 #include <array>
-#include <cstdlib>
-#include <string>
+#include <optional>
 
-/// A context of the driver that the process has loaded, current on a small pbuffer: somebody else's
-/// context, made without the library. A test must leave no GL error behind.
+/// A context of the driver that the process has loaded, current on a small pbuffer, or on a window
+/// where there are none: somebody else's context, made without the library. A test must leave no GL error behind.
 class DriverContext : public testing::Test
 {
 protected:
@@ -20,15 +22,17 @@ protected:
 
     void SetUp() override
     {
-        const char* const platform = std::getenv("EGL_PLATFORM");
-        const char* const display = std::getenv("DISPLAY");
-        if (platform && std::string(platform) == "x11" && (!display || !*display))
-            GTEST_SKIP() << "no X server: DISPLAY is unset";
-        m_display = eglGetDisplay(EGL_DEFAULT_DISPLAY);
+        if (DriverIs({"wayland"}))
+        {
+            if (!CanMakeWaylandWindows())
+                GTEST_SKIP() << "built without Wayland";
+            m_window.emplace(kWidth, kHeight);
+        }
+        m_display = eglGetDisplay(m_window ? m_window->NativeDisplay() : EGL_DEFAULT_DISPLAY);
         ASSERT_EQ(eglInitialize(m_display, nullptr, nullptr), EGLBoolean{EGL_TRUE});
         eglBindAPI(EGL_OPENGL_ES_API);
         const EGLint wanted[] = {EGL_SURFACE_TYPE,
-                                 EGL_PBUFFER_BIT,
+                                 m_window ? EGL_WINDOW_BIT : EGL_PBUFFER_BIT,
                                  EGL_RENDERABLE_TYPE,
                                  EGL_OPENGL_ES3_BIT,
                                  EGL_RED_SIZE,
@@ -45,8 +49,7 @@ protected:
         const EGLint version[] = {EGL_CONTEXT_CLIENT_VERSION, 3, EGL_NONE};
         m_context = eglCreateContext(m_display, config, EGL_NO_CONTEXT, version);
         ASSERT_NE(m_context, EGL_NO_CONTEXT);
-        const EGLint size[] = {EGL_WIDTH, kWidth, EGL_HEIGHT, kHeight, EGL_NONE};
-        m_surface = eglCreatePbufferSurface(m_display, config, size);
+        m_surface = NewSurface(config);
         ASSERT_NE(m_surface, EGL_NO_SURFACE);
         ASSERT_EQ(eglMakeCurrent(m_display, m_surface, m_surface, m_context), EGLBoolean{EGL_TRUE});
     }
@@ -76,6 +79,15 @@ protected:
     }
 
 private:
+    EGLSurface NewSurface(EGLConfig config) const
+    {
+        const EGLint size[] = {EGL_WIDTH, kWidth, EGL_HEIGHT, kHeight, EGL_NONE};
+        return m_window
+                   ? eglCreateWindowSurface(m_display, config, m_window->NativeWindow(), nullptr)
+                   : eglCreatePbufferSurface(m_display, config, size);
+    }
+
+    std::optional<WaylandWindow> m_window; // where there are no pbuffers; goes last
     EGLDisplay m_display = EGL_NO_DISPLAY;
     EGLContext m_context = EGL_NO_CONTEXT;
     EGLSurface m_surface = EGL_NO_SURFACE;

@@ -1,6 +1,7 @@
 #ifndef NIB_TESTS_DRIVERS_EGL_ON_DRIVER_H
 #define NIB_TESTS_DRIVERS_EGL_ON_DRIVER_H
 
+#include "drivers/Driver.h"
 #include "drivers/RenderThreadSupport.h"
 #include "drivers/XWindow.h"
 
@@ -9,16 +10,6 @@
 #include <GLES3/gl3.h>
 
 #include <gtest/gtest.h>
-
-#include <cstdlib>
-#include <string_view>
-
-/// Whether this run is for a display without windows.
-inline bool IsSurfaceless()
-{
-    const char* platform = std::getenv("EGL_PLATFORM");
-    return platform != nullptr && std::string_view(platform) == "surfaceless";
-}
 
 /// Whether surfaces of the library's configuration may keep their content across swaps.
 inline bool CanPreserve()
@@ -36,8 +27,8 @@ class EglOnDriver : public testing::Test
 protected:
     void SetUp() override
     {
-        if (!IsSurfaceless() && !HasXServer())
-            GTEST_SKIP() << "there is no X server";
+        if (!HasPbuffers())
+            GTEST_SKIP() << kNoPbuffers;
     }
 
     void TearDown() override

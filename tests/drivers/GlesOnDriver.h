@@ -1,6 +1,7 @@
 #ifndef NIB_TESTS_DRIVERS_GLES_ON_DRIVER_H
 #define NIB_TESTS_DRIVERS_GLES_ON_DRIVER_H
 
+#include "drivers/Driver.h"
 #include "drivers/RenderThreadSupport.h"
 
 #include <nib/base.h>
@@ -39,10 +40,8 @@ class GlesOnDriver : public testing::Test
 protected:
     void SetUp() override
     {
-        const char* const platform = std::getenv("EGL_PLATFORM");
-        const char* const display = std::getenv("DISPLAY");
-        if (platform && std::string(platform) == "x11" && (!display || !*display))
-            GTEST_SKIP() << "no X server: DISPLAY is unset";
+        if (!HasPbuffers())
+            GTEST_SKIP() << kNoPbuffers;
         Nib::System::SetSDKCacheDirectoryPath((m_folder.Path() / "sdk").c_str());
         ASSERT_EQ(Nib::Egl::GetEglStatus(), 0) << "the driver does not start";
         parent.reset(

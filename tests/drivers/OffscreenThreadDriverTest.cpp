@@ -1,6 +1,7 @@
 // Offscreen render threads on the process's driver: what they share with their parent, and what
 // comes back after a pause.
 
+#include "drivers/Driver.h"
 #include "drivers/RenderThreadSupport.h"
 
 #include <nib/device.h>
@@ -69,6 +70,8 @@ class OffscreenThreadOnDriver : public testing::Test
 protected:
     void SetUp() override
     {
+        if (!HasPbuffers())
+            GTEST_SKIP() << kNoPbuffers;
         ASSERT_EQ(Egl::GetEglStatus(), 0) << "the driver does not start";
         parent.reset(GLES::CreateSurfaceRenderer("parent", RenderThreadGL::Medium));
         ASSERT_TRUE(parent->Start());

@@ -212,6 +212,10 @@ Rgba SampledAt(ITextureObject& texture, const std::string& where)
 TEST_P(PixelPairOnDriver, IsSampledAsItWasUploaded)
 {
     const PixelPair& pair = GetParam();
+    if (DriverIs({"swiftshader"}) && pair.storage != Storage::Byte && pair.layout != 4)
+        GTEST_SKIP() << "this driver compares what is sampled of any texture with the reference";
+    if (DriverIs({"swiftshader"}) && pair.memoryLayout == 12)
+        GTEST_SKIP() << "this driver updates no texture of an unsized depth format";
     OnThread(
         [&]
         {

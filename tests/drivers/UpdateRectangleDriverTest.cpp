@@ -58,7 +58,7 @@ protected:
 
 TEST_F(UpdateRectangleOnDriver, WindowKeepsItsContentWhereItCan)
 {
-    if (IsSurfaceless())
+    if (!HasXServer())
         GTEST_SKIP() << "this display has no windows";
     XWindow window(64, 48);
     ASSERT_NO_FATAL_FAILURE(Attach(window));
@@ -74,7 +74,7 @@ TEST_F(UpdateRectangleOnDriver, WindowKeepsItsContentWhereItCan)
 
 TEST_F(UpdateRectangleOnDriver, SecondFrameChangesOnlyWhatItDraws)
 {
-    if (IsSurfaceless())
+    if (!HasXServer())
         GTEST_SKIP() << "this display has no windows";
     if (!CanPreserve())
         GTEST_SKIP() << "windows lose their content in a swap";
@@ -106,7 +106,7 @@ TEST_F(UpdateRectangleOnDriver, SecondFrameChangesOnlyWhatItDraws)
 
 TEST_F(UpdateRectangleOnDriver, ScissorBoxIsExactWhereTheContentIsKnown)
 {
-    if (IsSurfaceless())
+    if (!HasXServer())
         GTEST_SKIP() << "this display has no windows";
     if (TellsAges())
         GTEST_SKIP() << "the age of a new buffer is 0";
@@ -128,7 +128,7 @@ TEST_F(UpdateRectangleOnDriver, ScissorBoxIsExactWhereTheContentIsKnown)
 
 TEST_F(UpdateRectangleOnDriver, NewBufferIsDirtyUntilItsCentreIsDrawn)
 {
-    if (IsSurfaceless())
+    if (!HasXServer())
         GTEST_SKIP() << "this display has no windows";
     if (TellsAges())
         GTEST_SKIP() << "the age of a buffer decides, not its centre";
@@ -146,7 +146,7 @@ TEST_F(UpdateRectangleOnDriver, NewBufferIsDirtyUntilItsCentreIsDrawn)
 
 TEST_F(UpdateRectangleOnDriver, NewBufferIsDirtyByItsAge)
 {
-    if (IsSurfaceless())
+    if (!HasXServer())
         GTEST_SKIP() << "this display has no windows";
     if (!TellsAges())
         GTEST_SKIP() << "this driver does not tell the age of a buffer";
@@ -167,7 +167,7 @@ TEST_F(UpdateRectangleOnDriver, NewBufferIsDirtyByItsAge)
 
 TEST_F(UpdateRectangleOnDriver, PbufferIsPresentedToo)
 {
-    if (!IsSurfaceless())
+    if (HasXServer())
         GTEST_SKIP() << "this display has windows";
     UpdateRectangle update;
 

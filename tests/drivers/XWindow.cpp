@@ -51,8 +51,7 @@ public:
 
 bool HasXServer()
 {
-    const std::string_view platform = Setting("EGL_PLATFORM");
-    if (!platform.empty() && platform != "x11")
+    if (std::string_view(Setting("EGL_PLATFORM")) != "x11")
         return false;
     static const Display* const kept = OpenDisplay(); // the process stays a client to its end
     return kept != nullptr;
