@@ -46,9 +46,9 @@ eglGetDisplay(EGLNativeDisplayType native)
 {
     if (DriverIs({"angle-lavapipe"}))
     {
-        constexpr EGLenum kPlatform = 0x3202;                // EGL_PLATFORM_ANGLE_ANGLE
-        constexpr EGLint kAttributes[] = {0x3203, 0x3450,    // its type: Vulkan
-                                          0x348F, 0x31DD,    // without a window system
+        constexpr EGLenum kPlatform = 0x3202;             // EGL_PLATFORM_ANGLE_ANGLE
+        constexpr EGLint kAttributes[] = {0x3203, 0x3450, // its type: Vulkan
+                                          0x348F, 0x31DD, // without a window system
                                           EGL_NONE};
         static auto* const get = reinterpret_cast<PFNEGLGETPLATFORMDISPLAYEXTPROC>(
             eglGetProcAddress("eglGetPlatformDisplayEXT"));

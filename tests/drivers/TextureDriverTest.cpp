@@ -212,8 +212,9 @@ Rgba SampledAt(ITextureObject& texture, const std::string& where)
 TEST_P(PixelPairOnDriver, IsSampledAsItWasUploaded)
 {
     const PixelPair& pair = GetParam();
-    if (DriverIs({"swiftshader"}) && pair.storage != Storage::Byte && pair.layout != 4)
-        GTEST_SKIP() << "this driver compares what is sampled of any texture with the reference";
+    const bool isWide = pair.storage != Storage::Byte && pair.storage != Storage::Short;
+    if (DriverIs({"swiftshader"}) && isWide && pair.layout != 4)
+        GTEST_SKIP() << "this driver compares what is sampled of other textures than depth, too";
     if (DriverIs({"swiftshader"}) && pair.memoryLayout == 12)
         GTEST_SKIP() << "this driver updates no texture of an unsized depth format";
     OnThread(
