@@ -10,7 +10,7 @@ namespace
 
 constexpr float kFade = 1.0f;       // pixels that the triangles reach beyond the outline
 constexpr float kSharpTurn = 0.94f; // cosine of the angle from which a join is round
-constexpr float kFlatness = 0.1f;   // pixels between a disc and the polygon that stands for it
+constexpr float kFlatness = 0.02f;  // pixels between a disc and the polygon that stands for it
 constexpr float kPi = 3.14159265f;
 
 void AddTriangle(std::vector<Vertex>& triangles, const Vertex& a, const Vertex& b, const Vertex& c)

@@ -7,6 +7,7 @@
 #include <wayland-client.h>
 #include <wayland-egl.h>
 
+#include <cstdint>
 #include <string_view>
 
 bool CanMakeWaylandWindows()
