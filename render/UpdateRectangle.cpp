@@ -284,21 +284,14 @@ void UpdateRectangle::Reset()
 
 bool UpdateRectangle::DoSwapBuffers()
 {
-    NIB_FUNCTION("bool Nib::UpdateRectangle::DoSwapBuffers()");
-    if ((m_mode & kPostSubBuffer) == 0 && !NeedsDamageRect())
-        return m_surface->SwapBuffers(); // logs for itself
-    if (PresentDamage() == EGL_TRUE)
-        return true;
-    NIB_LOG_ERROR("%s Failed. Err = %d", function, eglGetError());
-    return false;
-}
-
-EGLBoolean UpdateRectangle::PresentDamage()
-{
-    if ((m_mode & kPostSubBuffer) == 0)
-        return m_swapBuffersWithDamage(Display(), m_surface->Get(), &m_damageRect.x, 1);
-    return m_postSubBuffer(Display(), m_surface->Get(), m_damageRect.x, m_damageRect.y,
-                           m_damageRect.width, m_damageRect.height);
+    if ((m_mode & kPostSubBuffer) != 0)
+    {
+        return m_postSubBuffer(Display(), m_surface->Get(), m_damageRect.x, m_damageRect.y,
+                               m_damageRect.width, m_damageRect.height) == EGL_TRUE;
+    }
+    if (NeedsDamageRect())
+        return m_swapBuffersWithDamage(Display(), m_surface->Get(), &m_damageRect.x, 1) == EGL_TRUE;
+    return m_surface->SwapBuffers();
 }
 
 // ---- what it has come to ------------------------------------------------------------------------

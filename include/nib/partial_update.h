@@ -131,7 +131,6 @@ private:
 
     void RestrictToDirtyArea(const RectF& dirty, int rotation);
     void LogDamageRegionError() const;
-    EGLBoolean PresentDamage();
 
     EglSurface* m_surface; // not owned
     int m_hwRotation;      // quarter turns

@@ -27,7 +27,9 @@ const Names& ToldByGlAlone()
         // what makes pixels
         "glClear", "glClearColor", "glClearDepthf", "glClearStencil", "glDrawArraysInstanced",
         "glDrawElements", "glReadPixels", "glTexSubImage2D", "glPixelStorei",
-        "glFramebufferRenderbuffer"};
+        "glFramebufferRenderbuffer",
+        // the end of a frame: the result of the call is DoSwapBuffers's, the reason EGL's to tell
+        "eglPostSubBufferNV", "eglSwapBuffersWithDamageKHR"};
     return *names;
 }
 
