@@ -77,7 +77,7 @@ std::string Verdict(EGLConfig config, const EGLint* wanted, EGLConfig chosen)
     if (config == chosen)
         return "chosen";
     // What the chosen one lacks, too, was not asked for in the end: a desktop fallback.
-    const std::string lacking = Lacking(config, wanted);
+    std::string lacking = Lacking(config, wanted);
     if (!lacking.empty() && (chosen == nullptr || lacking != Lacking(chosen, wanted)))
         return lacking;
     if (!IsRgba8888(config))
