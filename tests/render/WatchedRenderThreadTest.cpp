@@ -48,7 +48,7 @@ TEST(WatchedRenderThread, ASwapThatDoesNotReturnIsToldWithItsThreadAndTask)
                               "(Nib::GLES::RenderThreadGLImpl::*)()>";
 
     AwaitWarning(driver, " to run " + frame + "; it has been running ");
-    AwaitWarning(driver, "has been running " + frame + " for ");
+    AwaitWarning(driver, ") has been running " + frame + " for "); // not the end of the line above
     driver.Release("eglSwapBuffers");
     caller.join();
 
