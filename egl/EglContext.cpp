@@ -1,4 +1,5 @@
 #include <nib/egl.h>
+#include <nib/trace.h>
 
 #include "base/Log.h"
 #include "egl/EglTokens.h"
@@ -9,6 +10,7 @@ namespace Nib
 bool EglContext::Create(const EGLContext shareContext, bool enableFrontBuffer, Priority priority)
 {
     NIB_FUNCTION("bool Nib::EglContext::Create(const EGLContext, bool, Nib::EglContext::Priority)");
+    const TraceScope trace("context", "create");
     const Egl* egl = Egl::GetInstance();
 
     EGLint version = 3;
@@ -49,6 +51,7 @@ void EglContext::Destroy()
     NIB_LOG_INFO("%s", function);
     if (m_context == EGL_NO_CONTEXT)
         return;
+    const TraceScope trace("context", "destroy");
     eglDestroyContext(Egl::GetInstance()->GetDisplay(), m_context);
     m_context = EGL_NO_CONTEXT;
 }

@@ -8,6 +8,7 @@
 #include "base/Log.h"
 
 #include <nib/exceptions.h>
+#include <nib/trace.h>
 
 #include <algorithm>
 
@@ -172,6 +173,7 @@ std::shared_ptr<const ShaderProgramCache::BinaryShader> OpenGLShaderProgram::Hel
 
 bool OpenGLShaderProgram::LoadFromBinary(const BinaryShader* binary)
 {
+    const TraceScope trace("program", "load program", {{"bytes", binary->length}});
     const GLuint program = glCreateProgram();
     glProgramBinary(program, binary->format, binary->bytes, binary->length);
     if (LinkStatus(program) == GL_FALSE)
@@ -183,6 +185,7 @@ bool OpenGLShaderProgram::LoadFromBinary(const BinaryShader* binary)
 
 void OpenGLShaderProgram::createShaderFromSource(std::vector<std::string>& attributes)
 {
+    const TraceScope trace("program", "compile program");
     if (!m_vertexSource || !m_fragmentSource)
         Throw<InvalidArgumentException>(
             "OpenGLRenderer::createShader: no shader source code provided.");
@@ -259,6 +262,7 @@ bool OpenGLShaderProgram::SaveToCache(ShaderProgramCache::BinaryShaderKey key,
 {
     NIB_FUNCTION("bool Nib::GLES::OpenGLShaderProgram::SaveToCache("
                  "ShaderProgramCache::BinaryShaderKey, const std::vector<std::string> &)");
+    const TraceScope trace("program", "save program");
     BinaryShader record;
     record.key = key;
     record.attributes = attributes;

@@ -2,9 +2,11 @@
 
 #include "base/Log.h"
 #include "render/NewTask.h"
+#include "thread/TaskScope.h"
 
 #include <nib/device.h>
 #include <nib/shader_manager.h>
+#include <nib/trace.h>
 
 #include <EGL/egl.h>
 
@@ -45,6 +47,7 @@ HWUIThreadGLImpl::HWUIThreadGLImpl(HwuiCallback* callback, const char* tag)
     NIB_LOG_INFO("HWUIThreadGLImpl::HWUIThreadGLImpl Constructor : %p", static_cast<void*>(this));
     m_observer = HWUIObjectObserver::GetInstance();
     ReadWatchdogEnvironment();
+    Trace::StartFromEnvironment();
     Post(NewTask(this, &HWUIThreadGLImpl::Init));
 }
 
@@ -124,6 +127,8 @@ bool HWUIThreadGLImpl::Render()
     NIB_LOG_INFO("%s", function);
     m_hwuiThreadId.store(GetNibCurrentThreadId(), std::memory_order_relaxed);
     AttachToThread(this);
+    const TraceLane lane(m_tag);
+    const TraceScope trace("frame", "frame");
     AutoCriticalSection lock(m_waitLock);
     if (eglGetCurrentContext() != EGL_NO_CONTEXT)
     {
@@ -156,10 +161,12 @@ void HWUIThreadGLImpl::RunTasks(TaskQueue* queue)
     while (const std::unique_ptr<ITask> task{queue->Pop()})
     {
         const WatchedCall call(WatchedCall::Kind::Run, m_watched, task.get());
+        const TaskScope trace(*task);
         task->run();
         ++count;
     }
     NIB_LOG_DEBUG("HWUIThreadGLImpl::RunTasks count=%d", count);
+    Trace::Counter("queue", "queue", count); // until this frame
 }
 
 // ---- waiting for a frame ----
@@ -192,6 +199,7 @@ bool HWUIThreadGLImpl::waitForCompleting()
 bool HWUIThreadGLImpl::WaitForNextFrame(const char* function)
 {
     const WatchedCall wait(m_watched, "draw its next frame");
+    const TraceScope trace("wait", "wait", {{"for", m_tag}, {"until", "its next frame"}});
     AutoCriticalSection lock(m_waitLock);
     if (m_lockRequested)
     {
@@ -220,6 +228,7 @@ void HWUIThreadGLImpl::Lock(bool invokeIfNeeded)
         return;
     }
     const WatchedCall wait(m_watchedLock, "leave its safe lock");
+    const TraceScope trace("wait", "wait", {{"for", m_tag}, {"until", "its safe lock is free"}});
     AutoCriticalSection lock(m_waitLock);
     if (m_lockOwner.load(std::memory_order_relaxed) == 0)
         return TakeSafeLock();

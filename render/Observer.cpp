@@ -1,4 +1,5 @@
 #include <nib/managed_object.h>
+#include <nib/trace.h>
 
 #include "base/Log.h"
 
@@ -97,6 +98,7 @@ void Observer<IManagedObject>::Unsubscribe(Position position)
 
 void Observer<IManagedObject>::DispatchRelease()
 {
+    const TraceScope trace("context", "release objects");
     AutoCriticalSection guard(m_lock);
     Dispatch dispatch(*this);
     for (Position position = m_subscribers.end(); position != m_subscribers.begin();)
@@ -105,6 +107,7 @@ void Observer<IManagedObject>::DispatchRelease()
 
 void Observer<IManagedObject>::DispatchRestore()
 {
+    const TraceScope trace("context", "restore objects");
     AutoCriticalSection guard(m_lock);
     Dispatch dispatch(*this);
     for (Position position = m_subscribers.begin(); position != m_subscribers.end(); ++position)
@@ -114,6 +117,7 @@ void Observer<IManagedObject>::DispatchRestore()
 void Observer<IManagedObject>::DispatchRestore(
     const std::function<void(const std::exception&)>& failed)
 {
+    const TraceScope trace("context", "restore objects");
     AutoCriticalSection guard(m_lock);
     Dispatch dispatch(*this);
     for (Position position = m_subscribers.begin(); position != m_subscribers.end(); ++position)

@@ -5,6 +5,7 @@
 
 #include <nib/device.h>
 #include <nib/shader_manager.h>
+#include <nib/trace.h>
 
 namespace Nib::GLES
 {
@@ -38,6 +39,7 @@ void DetachFromWindow(HybridSurface& surface, const char* function)
 
 void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, EglContext& context)
 {
+    const TraceScope trace("context", "loss");
     observer.DispatchRelease();
     ShaderManager::GetInstance()->OnDestroyContext();
     worker.Pause(); // from the end of the running task on
@@ -47,6 +49,7 @@ void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, E
 
 void RestoreObjects(Observer<IManagedObject>& observer, const char* function)
 {
+    const TraceScope trace("context", "restore");
     observer.DispatchRestore(
         [function](const std::exception& failure)
         { NIB_LOG_ERROR("%s An object is not restored: %s", function, failure.what()); });

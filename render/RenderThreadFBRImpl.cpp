@@ -8,6 +8,7 @@
 
 #include <nib/device.h>
 #include <nib/shader_manager.h>
+#include <nib/trace.h>
 
 namespace Nib::GLES
 {
@@ -275,6 +276,7 @@ bool RenderThreadFBRImpl::Render()
 void RenderThreadFBRImpl::DoRender()
 {
     NIB_FUNCTION("void Nib::GLES::RenderThreadFBRImpl::DoRender()");
+    const TraceScope trace("frame", "frame");
     const bool attached = m_surface.IsAttachedToWindow();
     if (m_frontBufferPending)
     {
@@ -292,6 +294,7 @@ void RenderThreadFBRImpl::DoRender()
 
 void RenderThreadFBRImpl::SwitchToFrontBuffer(const char* function)
 {
+    const TraceScope trace("frame", "front buffer");
     EnableFrontBuffer();
     m_frontBufferPending = false;
     const EGLint buffer = QueryActiveSurface(EGL_RENDER_BUFFER);

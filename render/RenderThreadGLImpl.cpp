@@ -7,6 +7,7 @@
 
 #include <nib/device.h>
 #include <nib/shader_manager.h>
+#include <nib/trace.h>
 
 namespace Nib::GLES
 {
@@ -171,6 +172,11 @@ void RenderThreadGLImpl::DoRender()
 {
     const UpdateRectangle::DamageRect damage = m_frameDamage.Take(
         {m_updateRectangle.GetScreenWidth(), m_updateRectangle.GetScreenHeight()});
+    const TraceScope trace("frame", "frame",
+                           {{"dirty x", damage.x},
+                            {"dirty y", damage.y},
+                            {"dirty width", damage.width},
+                            {"dirty height", damage.height}});
     if (!m_surface.IsAttachedToWindow())
         return OpenGLRenderer::finish();
     if (m_updateRectangle.NeedsDamageRect())

@@ -3,6 +3,7 @@
 #include <nib/device.h>
 #include <nib/egl.h>
 #include <nib/texture.h>
+#include <nib/trace.h>
 
 #include "base/Log.h"
 #include "device/DeviceLists.h"
@@ -46,6 +47,21 @@ template <typename Function>
 void Resolve(Function& entry, const char* name)
 {
     entry = reinterpret_cast<Function>(eglGetProcAddress(name));
+}
+
+/// As the log has it.
+const char* ModeText(std::uint32_t mode)
+{
+    switch (mode)
+    {
+    case kPostSubBufferMode: return "0x81";
+    case kDamageRegionMode: return "0x45";
+    case kTileAlignedMode: return "0x7";
+    case kTiledRenderingMode: return "0x25";
+    case kPreservedMode: return "0x9";
+    case kFullScreenMode: return "0x1";
+    default: return "none";
+    }
 }
 
 EGLDisplay Display()
@@ -284,6 +300,14 @@ void UpdateRectangle::Reset()
 
 bool UpdateRectangle::DoSwapBuffers()
 {
+    const bool isPart = (m_mode & kPostSubBuffer) != 0 || NeedsDamageRect();
+    const DamageRect part = isPart ? m_damageRect : DamageRect{0, 0, m_screenWidth, m_screenHeight};
+    const TraceScope trace("frame", "swap",
+                           {{"mode", ModeText(m_mode)},
+                            {"x", part.x},
+                            {"y", part.y},
+                            {"width", part.width},
+                            {"height", part.height}});
     if ((m_mode & kPostSubBuffer) != 0)
     {
         return m_postSubBuffer(Display(), m_surface->Get(), m_damageRect.x, m_damageRect.y,

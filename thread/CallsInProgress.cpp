@@ -1,10 +1,8 @@
 #include "thread/CallsInProgress.h"
 
-#include <cstdio>
-#include <cstdlib>
-#include <memory>
+#include "thread/TypeName.h"
 
-#include <cxxabi.h>
+#include <cstdio>
 
 namespace Nib
 {
@@ -13,16 +11,6 @@ namespace
 {
 
 using Clock = CallsInProgress::Clock;
-
-std::string TypeName(const std::type_info* type)
-{
-    if (type == nullptr)
-        return "a task without type information";
-    int status = 0;
-    const std::unique_ptr<char, void (*)(void*)> name(
-        abi::__cxa_demangle(type->name(), nullptr, nullptr, &status), &std::free);
-    return name ? name.get() : type->name();
-}
 
 std::string Seconds(Clock::duration time)
 {

@@ -2,6 +2,7 @@
 
 #include "base/Log.h"
 #include "thread/CallsInProgress.h"
+#include "thread/TypeName.h"
 
 #include <nib/base.h>
 
@@ -169,7 +170,7 @@ void WatchedCall::Enter(Kind kind, const WatchTarget& target, const ITask* task,
     m_kind = kind;
     m_task = task;
     m_caller = GetNibCurrentThreadId();
-    m_type.store(task ? &typeid(*task) : nullptr, std::memory_order_relaxed);
+    m_type = task ? TypeOf(*task) : nullptr;
     m_what = what;
     m_begin = CallsInProgress::Clock::now();
     m_reported = false;

@@ -80,10 +80,8 @@ private:
     const WatchTarget* m_target = nullptr;
     Kind m_kind;
     std::uint64_t m_caller;
-    // Atomic, so that the compiler does not take for granted what tasks of a program without type
-    // information do not have.
-    std::atomic<const std::type_info*> m_type;
-    const ITask* m_task; // only to be compared
+    const std::type_info* m_type; // null without one
+    const ITask* m_task;          // only to be compared
     const char* m_what;
     std::chrono::steady_clock::time_point m_begin;
     bool m_reported;

@@ -2,7 +2,9 @@
 
 #include "base/Log.h"
 #include "thread/GlobalLocker.h"
+#include "thread/TaskScope.h"
 
+#include <algorithm>
 #include <memory>
 #include <new>
 
@@ -83,6 +85,7 @@ WorkerThreadImpl::WorkerThreadImpl(const char* name, Thread::ThreadPriority prio
                  "Thread::ThreadPriority, bool)");
     NIB_LOG_INFO("%s Initialize", function);
     ReadWatchdogEnvironment();
+    Trace::StartFromEnvironment();
 }
 
 WorkerThreadImpl::~WorkerThreadImpl()
@@ -167,6 +170,9 @@ bool WorkerThreadImpl::IsStarted()
 
 bool WorkerThreadImpl::EnqueueAsyncTask(ITask* task)
 {
+    // Before the worker can take the task and tell of it: what it tells last is how it is.
+    if (Trace::IsOn())
+        TraceQueue(m_pending.load(std::memory_order_relaxed) + 1);
     m_queue.Push(task);
     OnNewAsyncTask();
     return true;
@@ -179,6 +185,13 @@ void WorkerThreadImpl::OnNewAsyncTask()
     const std::int32_t pending = m_pending.fetch_add(1, std::memory_order_seq_cst) + 1;
     if (pending < 2 && !IsPaused())
         Wakeup();
+}
+
+/// The number of tasks that wait, on the lane of the worker, which has one while it has a thread.
+void WorkerThreadImpl::TraceQueue(std::int32_t pending) const
+{
+    if (const std::uint64_t thread = m_threadNumber.load(std::memory_order_relaxed))
+        Trace::Counter("queue", "queue", std::max(pending, 0), thread, m_name);
 }
 
 bool WorkerThreadImpl::WaitForExecution(int* queuedAfter)
@@ -200,6 +213,7 @@ bool WorkerThreadImpl::WaitForExecution(int* queuedAfter)
 void WorkerThreadImpl::RunSyncTask(ITask* task, bool aheadOfQueue, bool deleteAfterRun)
 {
     const WatchedCall wait(WatchedCall::Kind::Wait, m_watched, task);
+    const TaskScope trace(m_name, *task);
     AutoCriticalSection outer(m_outerLock);
     AutoCriticalSection sync(m_syncLock);
     if (aheadOfQueue)
@@ -224,6 +238,7 @@ void WorkerThreadImpl::ThreadProcedure(void* worker)
 {
     auto* self = static_cast<WorkerThreadImpl*>(worker);
     self->m_threadNumber.store(GetNibCurrentThreadId(), std::memory_order_relaxed);
+    const TraceLane lane(self->m_name);
     self->RunUntilQuit();
 }
 
@@ -238,7 +253,10 @@ void WorkerThreadImpl::RunTurn()
     const bool paused = IsPaused();
     const bool hasWork = paused ? HasDirectTask() : m_pending.load(std::memory_order_acquire) > 0;
     if (!hasWork)
+    {
+        const TraceScope idle("wait", "idle");
         SleepUntilNeeded();
+    }
     if (HasDirectTask())
         RunDirectTask();
     else if (hasWork ? !paused : !IsPaused())
@@ -258,7 +276,9 @@ void WorkerThreadImpl::SleepUntilNeeded()
 
 void WorkerThreadImpl::RunDirectTask()
 {
-    m_pending.fetch_sub(1, std::memory_order_acq_rel);
+    const std::int32_t pending = m_pending.fetch_sub(1, std::memory_order_acq_rel) - 1;
+    if (Trace::IsOn())
+        TraceQueue(pending);
     RunSynchronously(m_directTask, m_deleteDirectTask);
 }
 
@@ -267,7 +287,9 @@ void WorkerThreadImpl::RunOneAsyncTask()
     ITask* const task = m_queue.Pop();
     if (task == nullptr)
         return;
-    m_pending.fetch_sub(1, std::memory_order_acq_rel);
+    const std::int32_t pending = m_pending.fetch_sub(1, std::memory_order_acq_rel) - 1;
+    if (Trace::IsOn())
+        TraceQueue(pending);
     RunGuarded(task);
     delete task;
 }
@@ -288,6 +310,7 @@ bool WorkerThreadImpl::RunSynchronously(std::atomic<ITask*>& task, bool deleteAf
 void WorkerThreadImpl::RunGuarded(ITask* task)
 {
     const WatchedCall call(WatchedCall::Kind::Run, m_watched, task);
+    const TaskScope trace(*task, &typeid(QueuedSyncTask));
     if (!m_globalLock || !task->isGlobalLockAllowed())
         return task->run();
     AutoCriticalSection guard(GlobalLocker::m_guard);

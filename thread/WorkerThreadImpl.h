@@ -53,6 +53,7 @@ private:
     void RunOneAsyncTask();
     bool RunSynchronously(std::atomic<ITask*>& task, bool deleteAfterRun);
     void RunGuarded(ITask* task);
+    void TraceQueue(std::int32_t pending) const;
 
     // Sequentially consistent together with m_pending: a producer that counts after the worker's
     // last look must see that the worker is no longer paused, or it would not wake it.

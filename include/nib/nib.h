@@ -26,6 +26,7 @@
 #include <nib/shader_manager.h>
 #include <nib/task.h>
 #include <nib/texture.h>
+#include <nib/trace.h>
 #include <nib/version.h>
 #include <nib/watchdog.h>
 #include <nib/worker_thread.h>

@@ -167,8 +167,9 @@ TEST(Watchdog, NamesTheWorkerTheTaskAndWhatKeepsItWaiting)
 TEST(Watchdog, SaysThatAWorkerIsPaused)
 {
     SimDriver driver;
-    const WorkerPtr worker(IWorkerThread::CreateInstance_NoLock("canvas", 0));
-    worker->Start(kPaused);
+    const WorkerPtr worker = Started("canvas");
+    CallAndWait(*worker); // its thread is there, or the line would say that it is not started
+    worker->Pause();
     Watchdog::SetLimit(kShortest);
     std::thread caller([&] { CallAndWait(*worker); });
     AwaitWarning(driver, "WaitedForTask; it is paused.");

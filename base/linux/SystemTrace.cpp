@@ -1,0 +1,11 @@
+#include "base/SystemTrace.h"
+
+namespace Nib
+{
+
+std::unique_ptr<OwnedTraceSink> NewSystemTrace()
+{
+    return nullptr;
+}
+
+} // namespace Nib
