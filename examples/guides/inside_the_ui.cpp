@@ -67,12 +67,14 @@ private:
 int main()
 {
     Host host;
+    // [guest]
     Nib::HwuiCallback callback{nullptr,
                                [](void*, void* context, int)
                                { return static_cast<Host*>(context)->RequestFrame(); },
                                &host};
     std::unique_ptr<Nib::RenderThreadHWUI> guest(
         Nib::RendererFactory::CreateHWUIRenderer(&callback, "guest"));
+    // [guest]
 
     std::thread hostThread(
         [&]
@@ -80,15 +82,18 @@ int main()
             host.Run(
                 [&]
                 {
+                    // [callback]
                     glEnable(GL_BLEND); // the host's own state
                     Nib::OpenGLRenderer::OpenGlState state;
                     state.store();
                     guest->Render();
                     state.restore();
+                    // [callback]
                 });
         });
 
     std::atomic<int> drawn{0};
+    // [post]
     for (int i = 0; i < 3; ++i)
     {
         Ink::Post(*guest->GetMsgQueue(),
@@ -100,6 +105,7 @@ int main()
                   });
         guest->GetMsgQueue()->waitForCompleting(); // asks the host for a frame and waits for it
     }
+    // [post]
     host.Stop();
     hostThread.join();
     guest.reset();

@@ -15,11 +15,13 @@ const char* const kVertexShader = "attribute vec2 a_position;\n"
 const char* const kFragmentShader = "precision mediump float;\n"
                                     "void main() { gl_FragColor = vec4(1.0); }\n";
 
+// [shared]
+/// The one program "white" of the context that is current here. In a task.
 Nib::IShaderProgram* SharedProgram()
 {
     using Nib::ShaderManager;
     ShaderManager* const manager = ShaderManager::GetInstance();
-    const ShaderManager::Key key("white"); // of the context that is current here
+    const ShaderManager::Key key("white");
     ShaderManager::Entry entry;
     if (!manager->Find(key, &entry))
         entry.program =
@@ -28,6 +30,7 @@ Nib::IShaderProgram* SharedProgram()
     manager->Add(key, entry);
     return static_cast<Nib::IShaderProgram*>(entry.program);
 }
+// [shared]
 
 } // namespace
 
@@ -43,13 +46,15 @@ int main()
               {
                   IShaderProgram* const program = SharedProgram();
                   isShared = SharedProgram() == program;
-                  program->Activate();
+                  // [cached]
+                  program->Activate(); // builds it: from its binary, or from its sources
                   program->Deactivate();
                   // Built before or just now: its binary is held under the key of its sources.
                   const auto cacheKey =
                       ShaderProgramCache::GetShaderKey(kVertexShader, kFragmentShader);
                   isCached =
                       ShaderProgramCache::GetInstance()->GetBinaryShader(cacheKey) != nullptr;
+                  // [cached]
 
                   ShaderManager::GetInstance()->Remove("white");
                   program->Release();
