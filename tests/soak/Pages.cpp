@@ -1,8 +1,11 @@
 #include "Pages.h"
 
+#include "Batch.h"
 #include "Failure.h"
 
 #include "InkStroke.h"
+
+#include <GLES3/gl3.h>
 
 #include <algorithm>
 #include <string>
@@ -38,11 +41,16 @@ Ink::PenPoint SomePoint(Random& random, int width, int height)
     return {x, y, 0.5f * static_cast<float>(random.Between(2, 20))};
 }
 
-void DrawStrokes(int page, Ink::InkSession& session, const std::function<void()>& afterPiece)
+/// softpipe blends in the pixels of a tile as it has computed them, and rounds them to bytes when the
+/// tile is written back: whoever saves a page in between gets another last bit.
+bool RoundsLate(Nib::RenderThreadGL& thread)
 {
-    Random random(static_cast<std::uint64_t>(page));
-    for (int i = 0; i < kStrokesOfPage; ++i)
-        DrawStroke(session, random, kPageWidth, kPageHeight, afterPiece);
+    std::string driver;
+    Batch batch;
+    batch.Post(thread,
+               [&driver] { driver = reinterpret_cast<const char*>(glGetString(GL_RENDERER)); });
+    batch.Finish();
+    return driver == "softpipe";
 }
 
 void RequireNoError(Ink::InkSession& session)
@@ -71,8 +79,23 @@ void DrawStroke(Ink::InkSession& session, Random& random, int width, int height,
     }
 }
 
+void Pages::DrawStrokes(int page, Ink::InkSession& session, const std::function<void()>& afterPiece)
+{
+    const auto behindPiece = [&]
+    {
+        if (m_roundsLate)
+            session.ReadPixels(); // so that a lost context, which reads them too, changes nothing
+        if (afterPiece)
+            afterPiece();
+    };
+    Random random(static_cast<std::uint64_t>(page));
+    for (int i = 0; i < kStrokesOfPage; ++i)
+        DrawStroke(session, random, kPageWidth, kPageHeight, behindPiece);
+}
+
 void Pages::MakeReferences(Nib::RenderThreadGL& thread)
 {
+    m_roundsLate = RoundsLate(thread);
     for (int page = 0; page < kCount; ++page)
     {
         Ink::InkSession session(thread, kPageWidth, kPageHeight, kPaper);

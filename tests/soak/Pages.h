@@ -42,6 +42,11 @@ public:
 private:
     using Pixels = std::vector<std::uint8_t>;
 
+    /// Draws the strokes of page @p page, on every driver with the same roundings.
+    void DrawStrokes(int page, Ink::InkSession& session, const std::function<void()>& afterPiece);
+
+    bool m_roundsLate =
+        false; ///< the driver keeps pixels exact until they are read or their target goes
     std::vector<Pixels> m_references;
     std::atomic<int> m_drawn{0};
 };
