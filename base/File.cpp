@@ -41,13 +41,20 @@ int OpenFlags(const char* mode)
     return flags;
 }
 
-int OpenRetrying(const char* path, int flags, mode_t permissions)
+// Calls @p open, which gives a descriptor, until no signal interrupts it.
+template <typename Open>
+int OpenRetrying(Open open)
 {
     int descriptor = -1;
     do
-        descriptor = open(path, flags, permissions);
+        descriptor = open();
     while (descriptor < 0 && errno == EINTR);
     return descriptor;
+}
+
+mode_t PermissionsOf(const char* mode)
+{
+    return std::strchr(mode, 'p') ? kPrivateFileMode : kFileMode;
 }
 
 // Moves @p length bytes with @p transfer, which is read() or write(), in as many calls as the
@@ -91,8 +98,20 @@ bool File::Construct(const String* path, const char* mode, bool createParents)
     }
     if (createParents)
         MakeParentFolders(path->Get());
-    m_descriptor =
-        OpenRetrying(path->Get(), flags, std::strchr(mode, 'p') ? kPrivateFileMode : kFileMode);
+    m_descriptor = OpenRetrying([&] { return open(path->Get(), flags, PermissionsOf(mode)); });
+    return m_descriptor >= 0;
+}
+
+bool File::ConstructIn(int folder, const char* name, const char* mode)
+{
+    Close();
+    const int flags = name && mode ? OpenFlags(mode) : -1;
+    if (flags < 0)
+    {
+        errno = EINVAL;
+        return false;
+    }
+    m_descriptor = OpenRetrying([&] { return openat(folder, name, flags, PermissionsOf(mode)); });
     return m_descriptor >= 0;
 }
 
@@ -103,6 +122,15 @@ std::size_t File::Read(void* buffer, std::size_t size, std::size_t count)
     const auto transfer = [&](std::size_t at, std::size_t length)
     { return read(m_descriptor, static_cast<char*>(buffer) + at, length); };
     return TransferAll(transfer, size * count) / size;
+}
+
+std::size_t File::ReadSome(void* buffer, std::size_t size)
+{
+    ssize_t got = -1;
+    do
+        got = read(m_descriptor, buffer, size);
+    while (got < 0 && errno == EINTR);
+    return got < 0 ? 0 : static_cast<std::size_t>(got);
 }
 
 std::size_t File::Write(const void* buffer, std::size_t size, std::size_t count)

@@ -1,9 +1,6 @@
 #include "gles/BinaryShaderFile.h"
 
-#include <zlib.h>
-
-#include <algorithm>
-#include <limits>
+#include "gles/Crc32.h"
 
 namespace Nib
 {
@@ -44,22 +41,6 @@ BinaryShaderHeader MakeHeader(const ShaderProgramCache::BinaryShader& shader)
     return {kBinaryShaderMagic, shader.format,
             static_cast<std::uint64_t>(std::int64_t{shader.length}), attributeSize,
             shader.attributes.size()};
-}
-
-std::uint64_t ContinueCrc(std::uint64_t crc, const void* data, std::size_t size)
-{
-    // In pieces that crc32() can count; the zlib of older devices has no crc32_z(). A null pointer
-    // would start anew in zlib, so no data is no call.
-    const auto* bytes = static_cast<const Bytef*>(data);
-    while (size != 0)
-    {
-        const auto piece =
-            static_cast<uInt>(std::min<std::size_t>(size, std::numeric_limits<uInt>::max()));
-        crc = crc32(static_cast<uLong>(crc), bytes, piece);
-        bytes += piece;
-        size -= piece;
-    }
-    return crc;
 }
 
 bool WriteBinaryShader(File& file, const ShaderProgramCache::BinaryShader& shader)

@@ -28,9 +28,6 @@ inline constexpr std::uint64_t kLargestAttributes = 100000; ///< bytes; more is 
 
 BinaryShaderHeader MakeHeader(const ShaderProgramCache::BinaryShader& shader);
 
-/// Continues a CRC-32 over @p size bytes. Start with 0.
-std::uint64_t ContinueCrc(std::uint64_t crc, const void* data, std::size_t size);
-
 /// Writes @p shader as a file of its own, in one open file.
 /// @return whether the system took every byte
 bool WriteBinaryShader(File& file, const ShaderProgramCache::BinaryShader& shader);

@@ -1,9 +1,12 @@
 #include "gles/BinaryShaderReader.h"
 
 #include "base/Log.h"
+#include "gles/Crc32.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <climits>
+#include <cstring>
 #include <vector>
 
 namespace Nib
@@ -30,6 +33,7 @@ BinaryShaderReader::BinaryShaderReader(File& file)
     : m_file(file), m_shader(std::make_unique<ShaderProgramCache::BinaryShader>())
 {
     errno = 0; // a file that is merely too short sets none
+    m_firstSize = file.ReadSome(m_first, sizeof m_first);
 }
 
 std::unique_ptr<ShaderProgramCache::BinaryShader> BinaryShaderReader::Read()
@@ -47,10 +51,20 @@ bool BinaryShaderReader::Fail(ShaderFileFault fault)
     return false;
 }
 
+/// The next @p size bytes of the file; false when there are fewer.
+bool BinaryShaderReader::Take(void* out, std::size_t size)
+{
+    const std::size_t here = std::min(size, m_firstSize - m_taken);
+    std::memcpy(out, m_first + m_taken, here);
+    m_taken += here;
+    const std::size_t rest = size - here;
+    return rest == 0 || m_file.Read(static_cast<unsigned char*>(out) + here, 1, rest) == rest;
+}
+
 bool BinaryShaderReader::ReadHeader()
 {
-    if (m_file.Read(&m_header, 1, sizeof m_header) != sizeof m_header ||
-        m_header.magic != kBinaryShaderMagic || m_header.programLength == 0)
+    if (!Take(&m_header, sizeof m_header) || m_header.magic != kBinaryShaderMagic ||
+        m_header.programLength == 0)
         return Fail(ShaderFileFault::Header);
     if (m_header.programLength > kLongestProgram || m_header.attributeSize > kLargestAttributes)
         return Fail(ShaderFileFault::Size);
@@ -63,7 +77,7 @@ bool BinaryShaderReader::ReadProgram()
     const auto length = static_cast<std::size_t>(m_header.programLength);
     m_shader->bytes = new unsigned char[length];
     m_shader->length = static_cast<std::int32_t>(length);
-    if (m_file.Read(m_shader->bytes, 1, length) != length)
+    if (!Take(m_shader->bytes, length))
         return Fail(ShaderFileFault::Program);
     m_crc = ContinueCrc(m_crc, m_shader->bytes, length);
     return true;
@@ -74,7 +88,7 @@ bool BinaryShaderReader::ReadAttributes()
     if (m_header.attributeSize == 0)
         return true; // the number of names is then not looked at
     std::vector<unsigned char> block(static_cast<std::size_t>(m_header.attributeSize));
-    if (m_file.Read(block.data(), 1, block.size()) != block.size())
+    if (!Take(block.data(), block.size()))
         return Fail(ShaderFileFault::Attributes);
     m_crc = ContinueCrc(m_crc, block.data(), block.size());
     const bool isParsed = ShaderProgramCache::ParseShaderAttributes(
@@ -86,7 +100,7 @@ bool BinaryShaderReader::ReadAttributes()
 
 bool BinaryShaderReader::CheckSum()
 {
-    if (m_file.Read(&m_storedCrc, sizeof m_storedCrc, 1) != 1)
+    if (!Take(&m_storedCrc, sizeof m_storedCrc))
         return Fail(ShaderFileFault::NoSum);
     return m_storedCrc == m_crc || Fail(ShaderFileFault::Sum);
 }

@@ -22,7 +22,8 @@ enum class ShaderFileFault
 };
 
 /// Reads one binary shader file from its beginning to its end, and believes nothing in it before it
-/// was checked: sizes before memory is taken, the sum before the record is handed out.
+/// was checked: sizes before memory is taken, the sum before the record is handed out. Large: keep
+/// it on the stack.
 class BinaryShaderReader
 {
 public:
@@ -41,13 +42,20 @@ public:
     void LogFault(const char* path, const char* function) const;
 
 private:
+    bool Take(void* out, std::size_t size);
     bool ReadHeader();
     bool ReadProgram();
     bool ReadAttributes();
     bool CheckSum();
     bool Fail(ShaderFileFault fault);
 
+    // The beginning of a file, mostly all of it, comes in one system call.
+    static constexpr std::size_t kFirstRead = 16384;
+
     File& m_file;
+    unsigned char m_first[kFirstRead];
+    std::size_t m_firstSize; ///< bytes of it that came
+    std::size_t m_taken = 0; ///< bytes of those that were handed out
     BinaryShaderHeader m_header{};
     std::uint64_t m_crc = 0;
     std::uint64_t m_storedCrc = 0;

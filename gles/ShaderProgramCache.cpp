@@ -2,6 +2,8 @@
 #include "gles/BinaryShaderFile.h"
 #include "gles/BinaryShaderReader.h"
 #include "gles/CacheFileNames.h"
+#include "gles/Crc32.h"
+#include "gles/FolderHandle.h"
 #include "gles/SymbolicLink.h"
 
 #include <nib/shader_cache.h>
@@ -100,7 +102,10 @@ ShaderProgramCache* ShaderProgramCache::GetInstance()
     return m_instance.get();
 }
 
-ShaderProgramCache::ShaderProgramCache() : m_initialized(false), m_lock(false) {}
+ShaderProgramCache::ShaderProgramCache()
+    : m_initialized(false), m_folder(std::make_unique<FolderHandle>()), m_lock(false)
+{
+}
 
 ShaderProgramCache::~ShaderProgramCache() = default;
 
@@ -141,6 +146,7 @@ bool ShaderProgramCache::Init()
     {
         RemoveStaleTemporaries(m_cacheDirectory); // of processes that were ended while they wrote
     }
+    m_folder->Hold(m_cacheDirectory);
     m_initialized = true;
     return true;
 }
@@ -277,15 +283,12 @@ ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderK
 {
     NIB_FUNCTION("ShaderProgramCache::BinaryShader *Nib::ShaderProgramCache::LoadFromFile("
                  "ShaderProgramCache::BinaryShaderKey)");
-    const std::string name = GetFileName(key);
-    const char* const path = name.c_str();
-    String filePath;
-    filePath.Construct(path);
     File file;
-    if (!HasOwnFolder() || !file.Construct(&filePath, "rbn", false))
+    if (!OpenToRead(file, key))
     {
-        NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, errno,
-                      path);
+        const int error = errno;
+        NIB_LOG_ERROR("%s Failed to create shader binary file. Err=%d. File=%s", function, error,
+                      GetFileName(key).c_str());
         return nullptr;
     }
     BinaryShaderReader reader(file);
@@ -293,8 +296,22 @@ ShaderProgramCache::BinaryShader* ShaderProgramCache::LoadFromFile(BinaryShaderK
     if (shader)
         shader->key = key;
     else
-        reader.LogFault(path, function);
+        reader.LogFault(GetFileName(key).c_str(), function);
     return shader.release();
+}
+
+/// Through the handle, which spares asking whether the folder is a link; else by its path, where the
+/// folder may be another one since.
+bool ShaderProgramCache::OpenToRead(File& file, BinaryShaderKey key)
+{
+    if (m_folder->OpenToRead(file, ShaderFileName(key)))
+        return true;
+    String path;
+    path.Construct(GetFileName(key).c_str());
+    if (!HasOwnFolder() || !file.Construct(&path, "rbn", false))
+        return false;
+    m_folder->Hold(m_cacheDirectory);
+    return true;
 }
 
 // ---- files, as tools see them -------------------------------------------------------------------

@@ -282,8 +282,15 @@ public:
     /// createParents makes the missing folders of the path first.
     bool Construct(const String* path, const char* mode, bool createParents);
 
+    /// As above, for the file @p name of the open folder whose descriptor is @p folder.
+    bool ConstructIn(int folder, const char* name, const char* mode);
+
     /// Reads up to @p count items of @p size bytes and returns how many came complete.
     std::size_t Read(void* buffer, std::size_t size, std::size_t count);
+
+    /// Reads up to @p size bytes in one system call, which may bring fewer before the end of the file
+    /// too. Returns how many; 0 at the end, and on a failure.
+    std::size_t ReadSome(void* buffer, std::size_t size);
 
     /// Writes @p count items of @p size bytes and returns how many the system took complete.
     std::size_t Write(const void* buffer, std::size_t size, std::size_t count);

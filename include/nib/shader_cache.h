@@ -17,6 +17,8 @@
 namespace Nib
 {
 
+class FolderHandle;
+
 /// Program binaries by a key made from the source texts, in memory and in one file a key.
 ///
 /// The files stand in the folder RendererCache beside System::GetSDKCacheDirectoryPath(), named
@@ -109,6 +111,7 @@ private:
     std::shared_ptr<const BinaryShader> FindOrLoad(BinaryShaderKey key);
     BinaryShader* LoadFromFile(BinaryShaderKey key);
     bool SaveToFile(const BinaryShader* shader);
+    bool OpenToRead(File& file, BinaryShaderKey key);
     std::string GetFileName(BinaryShaderKey key) const;
     bool HasOwnFolder() const;
     void RemoveFile(BinaryShaderKey key) const;
@@ -120,7 +123,8 @@ private:
     bool m_initialized;
     std::string m_cacheDirectory;
     std::map<BinaryShaderKey, std::shared_ptr<const BinaryShader>> m_binaries;
-    CriticalSection m_lock; // guards all of the above, file operations included
+    std::unique_ptr<FolderHandle> m_folder; // the cache directory, for reading
+    CriticalSection m_lock;                 // guards all of the above, file operations included
 };
 
 } // namespace Nib

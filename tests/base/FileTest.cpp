@@ -63,6 +63,46 @@ std::set<int> OpenDescriptors()
 
 } // namespace
 
+TEST_F(FileTest, ReadSomeTakesWhatOneCallBrings)
+{
+    Put("file", "0123456789");
+    File file;
+    ASSERT_TRUE(Open(file, "file", "r"));
+    char bytes[8] = {};
+    EXPECT_EQ(file.ReadSome(bytes, 8), 8u);
+    EXPECT_EQ(std::string(bytes, 8), "01234567");
+    EXPECT_EQ(file.ReadSome(bytes, 8), 2u);
+    EXPECT_EQ(std::string(bytes, 2), "89");
+    EXPECT_EQ(file.ReadSome(bytes, 8), 0u);
+}
+
+TEST_F(FileTest, ReadSomeOfNoFileBringsNothing)
+{
+    File file;
+    char byte = 0;
+    EXPECT_EQ(file.ReadSome(&byte, 1), 0u);
+    EXPECT_EQ(errno, EBADF);
+}
+
+TEST_F(FileTest, OpensAFileInAFolderByItsName)
+{
+    Put("file", "content");
+    const int descriptor = open(folder.Path().c_str(), O_PATH | O_DIRECTORY);
+    char bytes[7] = {};
+    {
+        File file;
+        ASSERT_TRUE(file.ConstructIn(descriptor, "file", "r"));
+        EXPECT_EQ(file.Read(bytes, 1, 7), 7u);
+        EXPECT_FALSE(file.ConstructIn(descriptor, "none", "r")) << "and closes the one before";
+        EXPECT_EQ(errno, ENOENT);
+        EXPECT_EQ(file.Read(bytes, 1, 7), 0u);
+        EXPECT_FALSE(file.ConstructIn(descriptor, "file", "q"));
+        EXPECT_EQ(errno, EINVAL);
+    }
+    EXPECT_EQ(std::string(bytes, 7), "content");
+    close(descriptor);
+}
+
 TEST_F(FileTest, WritesAndReadsBytes)
 {
     File file;

@@ -137,6 +137,21 @@ NIB_REPLACES int open(const char* path, int flags, ...)
     return descriptor;
 }
 
+// Of the watched folder, which was opened before: its path is then not asked for.
+NIB_REPLACES int openat(int folder, const char* path, int flags, ...)
+{
+    va_list arguments;
+    va_start(arguments, flags);
+    const mode_t mode = (flags & (O_CREAT | O_TMPFILE)) != 0 ? va_arg(arguments, mode_t) : 0;
+    va_end(arguments);
+    Call call("open", folder);
+    if (call.Fails())
+        return -1;
+    const int descriptor = static_cast<int>(syscall(SYS_openat, folder, path, flags, mode));
+    call.Opened(descriptor);
+    return descriptor;
+}
+
 NIB_REPLACES ssize_t read(int descriptor, void* buffer, std::size_t length)
 {
     {

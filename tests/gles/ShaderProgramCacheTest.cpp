@@ -360,6 +360,29 @@ TEST_F(ProgramCache, ALinkInPlaceOfTheFolderIsNotReadThrough)
                      folder.File("sh5.dat")}));
 }
 
+TEST_F(ProgramCache, ALinkInPlaceOfTheFolderIsNotReadThroughWhileTheFolderLivesOn)
+{
+    const TemporaryFolder elsewhere;
+    WriteBytes(elsewhere / "sh5.dat", FileFields::Of("PLANTED", {}).File());
+    WriteBytes(folder.File("sh5.dat"), FileFields::Of("OWN", {}).File());
+    fs::rename(folder.Path(), folder.Path() + "-moved");
+    fs::create_symlink(elsewhere.Path(), folder.Path());
+
+    EXPECT_EQ(ProgramText(*cache->GetBinaryShader(5)), "OWN");
+}
+
+TEST_F(ProgramCache, AFolderMadeAnewIsReadFrom)
+{
+    fs::remove(folder.Path());
+    fs::create_directory(folder.Path());
+    WriteBytes(folder.File("sh5.dat"), FileFields::Of("FIRST", {}).File());
+    WriteBytes(folder.File("sh6.dat"), FileFields::Of("SECOND", {}).File());
+
+    EXPECT_EQ(ProgramText(*cache->GetBinaryShader(5)), "FIRST");
+    EXPECT_EQ(ProgramText(*cache->GetBinaryShader(6)), "SECOND");
+    EXPECT_EQ(Errors(), Texts());
+}
+
 TEST_F(ProgramCache, ALinkInPlaceOfTheFolderIsNotWrittenThrough)
 {
     const TemporaryFolder elsewhere;
