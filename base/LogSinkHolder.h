@@ -20,10 +20,10 @@ public:
     void Set(LogSink sink, void* context, int lowestPriority);
 
     /// Whether a line of @p priority is wanted: one relaxed load.
-    bool Wants(int priority) const
-    {
-        return priority >= m_lowestPriority.load(std::memory_order_relaxed);
-    }
+    bool Wants(int priority) const { return priority >= LowestWanted(); }
+
+    /// The lowest priority that is wanted; INT_MAX without a sink.
+    int LowestWanted() const { return m_lowestPriority.load(std::memory_order_relaxed); }
 
     /// Hands over one line, unless the calling thread is inside the sink.
     void Take(int priority, const char* message);

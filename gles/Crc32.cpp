@@ -3,6 +3,7 @@
 #include <zlib.h>
 
 #include <algorithm>
+#include <cstring>
 #include <limits>
 
 #if defined(__x86_64__)
@@ -33,92 +34,188 @@ std::uint64_t ContinueByZlib(std::uint64_t crc, const unsigned char* bytes, std:
 #if defined(__x86_64__)
 
 // A CRC is the remainder of the message, as a polynomial over {0, 1}, by a fixed one. So the first
-// 64 bytes may be replaced by what has the same remainder and lies further back: each 16 bytes, as
-// two halves, times the remainder of the power of x that they are moved by. The first bit of a byte
+// 16 bytes, a lane, may be replaced by what has the same remainder and lies further back: each of
+// their halves, times the remainder of the power of x that it is moved by. The first bit of a byte
 // is the lowest, which makes a product one place too long; the factors make up for it.
 
-constexpr std::uint32_t kPolynomial = 0xEDB88320; // x^32 and the rest, lowest power first
+constexpr std::uint64_t kPolynomial = 0x104C11DB7; // x^32 the highest bit
+constexpr int kDegree = 32;
 
-// The factor that moves a half by @p power places.
-constexpr std::uint64_t Factor(int power)
+constexpr std::uint64_t Reflected(std::uint64_t bits, int count)
 {
-    std::uint32_t remainder = 0x80000000; // 1
-    for (int i = 0; i < power; ++i)
-        remainder = (remainder >> 1) ^ ((remainder & 1) != 0 ? kPolynomial : 0);
-    return std::uint64_t{remainder} << 1;
+    std::uint64_t reflected = 0;
+    for (int i = 0; i < count; ++i)
+        reflected |= ((bits >> i) & 1) << (count - 1 - i);
+    return reflected;
 }
 
-struct Factors
+// The remainder of x to the @p power, as a factor.
+constexpr std::uint64_t Factor(int power)
 {
-    std::uint64_t first;  // of the half that comes first
-    std::uint64_t second; // of the other
+    std::uint64_t remainder = 1;
+    for (int i = 0; i < power; ++i)
+    {
+        remainder <<= 1;
+        if ((remainder >> kDegree) != 0)
+            remainder ^= kPolynomial;
+    }
+    return Reflected(remainder, kDegree) << 1;
+}
+
+// x^64 divided by the polynomial, by which a remainder is found without dividing.
+constexpr std::uint64_t Quotient()
+{
+    std::uint64_t quotient = 0;
+    std::uint64_t rest = std::uint64_t{1} << kDegree;
+    for (int place = kDegree; place >= 0; --place, rest <<= 1)
+    {
+        if ((rest >> kDegree) == 0)
+            continue;
+        quotient |= std::uint64_t{1} << place;
+        rest ^= kPolynomial;
+    }
+    return quotient;
+}
+
+struct Pair
+{
+    std::uint64_t first; // of the bytes that come first
+    std::uint64_t second;
 };
 
 constexpr std::size_t kLane = 16; // bytes
 constexpr std::size_t kLanes = 4; // folded side by side
 constexpr std::size_t kBlock = kLane * kLanes;
 
-constexpr Factors FactorsOver(std::size_t bytes)
+constexpr Pair FactorsOver(std::size_t bytes)
 {
     const int bits = static_cast<int>(bytes * 8);
-    return {Factor(bits + 32), Factor(bits - 32)};
+    return {Factor(bits + kDegree), Factor(bits - kDegree)};
 }
 
-constexpr Factors kOverBlock = FactorsOver(kBlock);
-constexpr Factors kOverLane = FactorsOver(kLane);
+constexpr Pair kOverBlock = FactorsOver(kBlock);
+constexpr Pair kOverLane = FactorsOver(kLane);
+constexpr Pair kOverHalf = {Factor(64), 0};
+constexpr Pair kDivision = {Reflected(kPolynomial, kDegree + 1),
+                            Reflected(Quotient(), kDegree + 1)};
 
 #define NIB_CARRYLESS __attribute__((target("pclmul")))
+
+// Which halves _mm_clmulepi64_si128 multiplies.
+constexpr int kFirstByFirst = 0x00;
+constexpr int kFirstBySecond = 0x10;
+constexpr int kSecondBySecond = 0x11;
 
 NIB_CARRYLESS inline __m128i Load(const unsigned char* bytes)
 {
     return _mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes));
 }
 
-NIB_CARRYLESS inline __m128i Vector(const Factors& factors)
+NIB_CARRYLESS inline void Store(unsigned char* bytes, __m128i lane)
 {
-    return _mm_set_epi64x(static_cast<long long>(factors.second),
-                          static_cast<long long>(factors.first));
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(bytes), lane);
+}
+
+NIB_CARRYLESS inline __m128i Vector(const Pair& pair)
+{
+    return _mm_set_epi64x(static_cast<long long>(pair.second), static_cast<long long>(pair.first));
 }
 
 // @p lane moved onto @p next.
 NIB_CARRYLESS inline __m128i Folded(__m128i lane, __m128i factors, __m128i next)
 {
-    const __m128i first = _mm_clmulepi64_si128(lane, factors, 0x00);
-    const __m128i second = _mm_clmulepi64_si128(lane, factors, 0x11);
+    const __m128i first = _mm_clmulepi64_si128(lane, factors, kFirstByFirst);
+    const __m128i second = _mm_clmulepi64_si128(lane, factors, kSecondBySecond);
     return _mm_xor_si128(_mm_xor_si128(first, second), next);
 }
 
-// The CRC over whole blocks, @p count of them and at least one.
-NIB_CARRYLESS std::uint64_t ContinueOverBlocks(std::uint64_t crc, const unsigned char* bytes,
-                                               std::size_t count)
+// The lane that stands for @p lane and for @p size bytes behind it, fewer than a lane.
+NIB_CARRYLESS inline __m128i FoldedOntoRest(__m128i lane, const unsigned char* rest,
+                                            std::size_t size)
+{
+    unsigned char joined[3 * kLane] = {}; // zeros before a message change nothing
+    Store(joined + kLane, lane);
+    std::memcpy(joined + 2 * kLane, rest, size);
+    return Folded(Load(joined + size), Vector(kOverLane), Load(joined + size + kLane));
+}
+
+// The remainder of a lane with 32 zeros behind it.
+NIB_CARRYLESS inline std::uint32_t Remainder(__m128i lane)
+{
+    const __m128i low = _mm_set_epi32(0, 0, 0, -1);
+    __m128i rest = _mm_xor_si128(_mm_clmulepi64_si128(lane, Vector(kOverLane), kFirstBySecond),
+                                 _mm_srli_si128(lane, 8)); // 96 bits
+    rest = _mm_xor_si128(
+        _mm_clmulepi64_si128(_mm_and_si128(rest, low), Vector(kOverHalf), kFirstByFirst),
+        _mm_srli_si128(rest, 4)); // 64 bits
+    const __m128i division = Vector(kDivision);
+    __m128i multiple = _mm_clmulepi64_si128(_mm_and_si128(rest, low), division, kFirstBySecond);
+    multiple = _mm_clmulepi64_si128(_mm_and_si128(multiple, low), division, kFirstByFirst);
+    rest = _mm_xor_si128(rest, multiple);
+    return static_cast<std::uint32_t>(_mm_cvtsi128_si32(_mm_srli_si128(rest, 4)));
+}
+
+// A lane that stands for all whole blocks; @p bytes is moved behind them. At least one.
+NIB_CARRYLESS inline __m128i FoldedBlocks(__m128i first, const unsigned char*& bytes,
+                                          std::size_t blocks)
 {
     __m128i lanes[kLanes];
     for (std::size_t i = 0; i < kLanes; ++i)
         lanes[i] = Load(bytes + i * kLane);
-    lanes[0] = _mm_xor_si128(lanes[0], _mm_cvtsi32_si128(static_cast<int>(~crc)));
-
+    lanes[0] = _mm_xor_si128(lanes[0], first);
     const __m128i overBlock = Vector(kOverBlock);
-    while (--count != 0)
+    while (--blocks != 0)
     {
         bytes += kBlock;
         for (std::size_t i = 0; i < kLanes; ++i)
             lanes[i] = Folded(lanes[i], overBlock, Load(bytes + i * kLane));
     }
-
-    const __m128i overLane = Vector(kOverLane);
+    bytes += kBlock;
     for (std::size_t i = 1; i < kLanes; ++i)
-        lanes[i] = Folded(lanes[i - 1], overLane, lanes[i]);
-    unsigned char last[kLane];
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(last), lanes[kLanes - 1]);
-    // Its remainder, from the register 0 on, which is this CRC for zlib.
-    return ContinueByZlib(0xFFFFFFFF, last, sizeof last);
+        lanes[i] = Folded(lanes[i - 1], Vector(kOverLane), lanes[i]);
+    return lanes[kLanes - 1];
+}
+
+// For a lane or more.
+NIB_CARRYLESS std::uint64_t ContinueByFolding(std::uint64_t crc, const unsigned char* bytes,
+                                              std::size_t size)
+{
+    const __m128i start = _mm_cvtsi32_si128(static_cast<int>(~crc));
+    const unsigned char* const end = bytes + size;
+    __m128i lane;
+    if (size >= kBlock)
+    {
+        lane = FoldedBlocks(start, bytes, size / kBlock);
+    }
+    else
+    {
+        lane = _mm_xor_si128(Load(bytes), start);
+        bytes += kLane;
+    }
+    for (; bytes + kLane <= end; bytes += kLane)
+        lane = Folded(lane, Vector(kOverLane), Load(bytes));
+    if (bytes != end)
+        lane = FoldedOntoRest(lane, bytes, static_cast<std::size_t>(end - bytes));
+    return static_cast<std::uint32_t>(~Remainder(lane));
 }
 
 #undef NIB_CARRYLESS
 
-bool CanFold()
+bool CanFold(std::size_t size)
 {
-    return __builtin_cpu_supports("pclmul") != 0;
+    return size >= kLane && __builtin_cpu_supports("pclmul") != 0;
+}
+
+#else
+
+constexpr bool CanFold(std::size_t)
+{
+    return false;
+}
+
+std::uint64_t ContinueByFolding(std::uint64_t crc, const unsigned char* bytes, std::size_t size)
+{
+    return ContinueByZlib(crc, bytes, size);
 }
 
 #endif
@@ -127,17 +224,8 @@ bool CanFold()
 
 std::uint64_t ContinueCrc(std::uint64_t crc, const void* data, std::size_t size)
 {
-    const auto* bytes = static_cast<const unsigned char*>(data);
-#if defined(__x86_64__)
-    const std::size_t blocks = size / kBlock;
-    if (blocks != 0 && CanFold())
-    {
-        crc = ContinueOverBlocks(crc, bytes, blocks);
-        bytes += blocks * kBlock;
-        size -= blocks * kBlock;
-    }
-#endif
-    return ContinueByZlib(crc, bytes, size);
+    const auto* const bytes = static_cast<const unsigned char*>(data);
+    return CanFold(size) ? ContinueByFolding(crc, bytes, size) : ContinueByZlib(crc, bytes, size);
 }
 
 } // namespace Nib

@@ -1,3 +1,4 @@
+#include "base/linux/LogThreshold.h"
 #include "base/LogSinkHolder.h"
 
 namespace Nib
@@ -6,6 +7,7 @@ namespace Nib
 bool SetLogSink(LogSink sink, void* context, int lowestPriority)
 {
     LogSinkHolder::Instance().Set(sink, context, lowestPriority);
+    FindLowestWanted();
     return true;
 }
 

@@ -27,7 +27,7 @@ constexpr NamedPriority kPriorities[] = {
     {"warn", ANDROID_LOG_WARN},       {"error", ANDROID_LOG_ERROR}, {"silent", ANDROID_LOG_SILENT},
 };
 
-int LowestPriority()
+int ReadLowestPriority()
 {
     const char* wanted = std::getenv("NIB_LOG");
     for (const NamedPriority& known : kPriorities)
@@ -72,10 +72,15 @@ void WriteToStandardError(std::string_view text)
 
 } // namespace
 
+int LowestLogged()
+{
+    static const int lowest = ReadLowestPriority();
+    return lowest;
+}
+
 bool IsLogged(int priority)
 {
-    static const int lowest = LowestPriority();
-    return priority >= lowest;
+    return priority >= LowestLogged();
 }
 
 std::string FormatLog(const char* format, std::va_list arguments)

@@ -7,7 +7,10 @@
 namespace Nib
 {
 
-/// Whether the user wants to see lines of @p priority: those from NIB_LOG on, which is read once.
+/// The lowest priority of lines that the user wants to see: NIB_LOG, which is read once.
+int LowestLogged();
+
+/// Whether the user wants to see lines of @p priority.
 bool IsLogged(int priority);
 
 /// The message as it goes out.

@@ -1,0 +1,106 @@
+#ifndef NIB_TESTS_STUB_HOTPATHS_H
+#define NIB_TESTS_STUB_HOTPATHS_H
+
+#include <nib/device.h>
+#include <nib/geometry.h>
+#include <nib/partial_update.h>
+#include <nib/render_target.h>
+#include <nib/shader.h>
+#include <nib/texture.h>
+
+#include <GLES3/gl3.h>
+
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+/// What the paths below work on: a page, a program with two uniforms, a triangle, a texture of 64 x
+/// 64 pixels, a frame that is presented in part. Made, used and ended on a render thread.
+class HotScene
+{
+public:
+    HotScene();
+    ~HotScene();
+    HotScene(const HotScene&) = delete;
+    HotScene& operator=(const HotScene&) = delete;
+
+    struct Release
+    {
+        template <typename T>
+        void operator()(T* object) const
+        {
+            object->Release();
+        }
+    };
+    template <typename T>
+    using Owned = std::unique_ptr<T, Release>;
+
+    // The library's.
+    Owned<Nib::ITextureObject> page;
+    Owned<Nib::IOffscreenRenderTarget> target;
+    Owned<Nib::IShaderProgram> program;
+    Owned<Nib::IParameterBinding> transform;
+    Owned<Nib::IParameterBinding> tint;
+    Owned<Nib::IGraphicsObject> mesh;
+    Owned<Nib::ITextureObject> texture;
+    Nib::OpenGLRenderer::OpenGlState state;
+    Nib::UpdateRectangle update;
+
+    // The same in GL's own names.
+    GLuint glProgram = 0;
+    GLint glTransform = -1;
+    GLint glTint = -1;
+    GLuint glVertices = 0;
+    GLuint glTexture = 0;
+
+    std::vector<std::uint32_t> pixels;
+
+private:
+    std::unique_ptr<Nib::EglSurface> m_screen;
+};
+
+/// One thing that drawing code does for every mesh or frame, with the library and as the GL calls
+/// that the library makes for it, each as often as it is told. The functions stand alone, so that a
+/// profile tells them apart by name.
+struct HotPath
+{
+    using Function = void (*)(HotScene&, int times);
+
+    const char* name;
+    Function gl;      ///< null for what makes no call
+    Function library; ///< makes the same calls
+};
+
+namespace HotPaths
+{
+
+void GlDraw(HotScene& scene, int times);
+void Draw(HotScene& scene, int times); ///< Activate, SetValue twice, GraphicsObject::Draw
+void GlState(HotScene& scene, int times);
+void State(HotScene& scene, int times); ///< OpenGlState: store and restore
+void GlUpdate(HotScene& scene, int times);
+void Update(HotScene& scene, int times); ///< of a texture
+void GlSetData(HotScene& scene, int times);
+void SetData(HotScene& scene, int times); ///< of a texture
+void GlReadPixels(HotScene& scene, int times);
+void ReadPixels(HotScene& scene, int times);
+void GlPresent(HotScene& scene, int times);
+void Present(HotScene& scene, int times);  ///< UseRect, Reset, DoSwapBuffers
+void GlProgram(HotScene& scene, int times);
+void Program(HotScene& scene, int times);  ///< made from a binary in memory, and released
+void Filtered(HotScene& scene, int times); ///< a log line that nobody wants to see
+
+} // namespace HotPaths
+
+inline constexpr HotPath kHotPaths[] = {
+    {"Draw", &HotPaths::GlDraw, &HotPaths::Draw},
+    {"State", &HotPaths::GlState, &HotPaths::State},
+    {"Update", &HotPaths::GlUpdate, &HotPaths::Update},
+    {"SetData", &HotPaths::GlSetData, &HotPaths::SetData},
+    {"ReadPixels", &HotPaths::GlReadPixels, &HotPaths::ReadPixels},
+    {"Present", &HotPaths::GlPresent, &HotPaths::Present},
+    {"Program", &HotPaths::GlProgram, &HotPaths::Program},
+    {"Filtered", nullptr, &HotPaths::Filtered},
+};
+
+#endif
