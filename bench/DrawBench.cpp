@@ -19,17 +19,20 @@ namespace
 
 constexpr int kDrawsPerFlush = 256;
 
-constexpr const char* kVertexShader = "attribute vec2 a_position;\n"
-                                      "attribute vec4 a_color;\n"
-                                      "varying vec4 v_color;\n"
-                                      "void main()\n"
-                                      "{\n"
-                                      "    v_color = a_color;\n"
-                                      "    gl_Position = vec4(a_position, 0.0, 1.0);\n"
-                                      "}\n";
+constexpr const char* kVertexShader =
+    "attribute vec2 a_position;\n"
+    "attribute vec4 a_color;\n"
+    "uniform mat4 u_transform;\n"
+    "varying vec4 v_color;\n"
+    "void main()\n"
+    "{\n"
+    "    v_color = a_color;\n"
+    "    gl_Position = u_transform * vec4(a_position, 0.0, 1.0);\n"
+    "}\n";
 constexpr const char* kFragmentShader = "precision mediump float;\n"
                                         "varying vec4 v_color;\n"
-                                        "void main() { gl_FragColor = v_color; }\n";
+                                        "uniform vec4 u_tint;\n"
+                                        "void main() { gl_FragColor = v_color * u_tint; }\n";
 
 struct Vertex
 {
@@ -65,16 +68,7 @@ public:
         m_program->Activate();
     }
 
-    /// Ends the draws so far, outside what is measured, so that the driver's queue stays short.
-    static void Settle(benchmark::State& state, int& draws)
-    {
-        if (++draws < kDrawsPerFlush)
-            return;
-        draws = 0;
-        state.PauseTiming();
-        glFinish();
-        state.ResumeTiming();
-    }
+    IShaderProgram& Program() const { return *m_program; }
 
 private:
     static ITextureObject* MakePage()
@@ -88,6 +82,26 @@ private:
     Owned<IOffscreenRenderTarget> m_target;
     Owned<IShaderProgram> m_program;
 };
+
+/// Times @p draw. The first draw, for which the driver translates the program, is outside what is
+/// measured; so is the end of the others, which keeps the driver's queue short.
+template <typename Draw>
+void Measure(benchmark::State& state, Draw draw)
+{
+    draw();
+    glFinish();
+    int draws = 0;
+    for (auto _ : state)
+    {
+        draw();
+        if (++draws < kDrawsPerFlush)
+            continue;
+        draws = 0;
+        state.PauseTiming();
+        glFinish();
+        state.ResumeTiming();
+    }
+}
 
 Owned<IGraphicsObject> Mesh()
 {
@@ -133,20 +147,63 @@ private:
     GLuint m_names[2] = {};
 };
 
+// ---- a mesh with its program --------------------------------------------------------------------
+
+constexpr float kTransform[16] = {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1};
+constexpr float kTint[4] = {1, 1, 1, 1};
+
+void BM_GlDraw(benchmark::State& state)
+{
+    const Scene scene;
+    const GlMesh mesh;
+    GLint name = 0;
+    glGetIntegerv(GL_CURRENT_PROGRAM, &name);
+    const auto program = static_cast<GLuint>(name);
+    const GLint transform = glGetUniformLocation(program, "u_transform");
+    const GLint tint = glGetUniformLocation(program, "u_tint");
+    Measure(state,
+            [&]
+            {
+                glUseProgram(program);
+                glUniformMatrix4fv(transform, 1, GL_FALSE, kTransform);
+                glUniform4fv(tint, 1, kTint);
+                mesh.SetUpAttributes();
+                glDrawArrays(GL_TRIANGLES, 0, 3);
+                glBindBuffer(GL_ARRAY_BUFFER, 0);
+            });
+}
+BENCHMARK(BM_GlDraw);
+
+void BM_Draw(benchmark::State& state)
+{
+    const Scene scene;
+    const Owned<IGraphicsObject> mesh = Mesh();
+    const Owned<IParameterBinding> transform(scene.Program().GetBindingIntf("u_transform"));
+    const Owned<IParameterBinding> tint(scene.Program().GetBindingIntf("u_tint"));
+    Measure(state,
+            [&]
+            {
+                scene.Program().Activate();
+                transform->SetValue(kTransform);
+                tint->SetValue(kTint);
+                mesh->Draw(0, -1, false);
+            });
+}
+BENCHMARK(BM_Draw);
+
 // ---- vertices -----------------------------------------------------------------------------------
 
 void BM_GlDrawVertices(benchmark::State& state)
 {
     const Scene scene;
     const GlMesh mesh;
-    int draws = 0;
-    for (auto _ : state)
-    {
-        mesh.SetUpAttributes();
-        glDrawArrays(GL_TRIANGLES, 0, 3);
-        glBindBuffer(GL_ARRAY_BUFFER, 0);
-        Scene::Settle(state, draws);
-    }
+    Measure(state,
+            [&]
+            {
+                mesh.SetUpAttributes();
+                glDrawArrays(GL_TRIANGLES, 0, 3);
+                glBindBuffer(GL_ARRAY_BUFFER, 0);
+            });
 }
 BENCHMARK(BM_GlDrawVertices);
 
@@ -154,12 +211,7 @@ void BM_DrawVertices(benchmark::State& state)
 {
     const Scene scene;
     const Owned<IGraphicsObject> mesh = Mesh();
-    int draws = 0;
-    for (auto _ : state)
-    {
-        mesh->Draw(0, -1, false);
-        Scene::Settle(state, draws);
-    }
+    Measure(state, [&] { mesh->Draw(0, -1, false); });
 }
 BENCHMARK(BM_DrawVertices);
 
@@ -169,15 +221,14 @@ void BM_GlDrawIndices(benchmark::State& state)
 {
     const Scene scene;
     const GlMesh mesh;
-    int draws = 0;
-    for (auto _ : state)
-    {
-        mesh.SetUpAttributes();
-        glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, mesh.Indices());
-        glDrawElements(GL_TRIANGLES, 3, GL_UNSIGNED_INT, nullptr);
-        glBindBuffer(GL_ARRAY_BUFFER, 0);
-        Scene::Settle(state, draws);
-    }
+    Measure(state,
+            [&]
+            {
+                mesh.SetUpAttributes();
+                glBindBuffer(GL_ELEMENT_ARRAY_BUFFER, mesh.Indices());
+                glDrawElements(GL_TRIANGLES, 3, GL_UNSIGNED_INT, nullptr);
+                glBindBuffer(GL_ARRAY_BUFFER, 0);
+            });
 }
 BENCHMARK(BM_GlDrawIndices);
 
@@ -185,12 +236,7 @@ void BM_DrawIndices(benchmark::State& state)
 {
     const Scene scene;
     const Owned<IGraphicsObject> mesh = Mesh();
-    int draws = 0;
-    for (auto _ : state)
-    {
-        mesh->Draw(0, -1, true);
-        Scene::Settle(state, draws);
-    }
+    Measure(state, [&] { mesh->Draw(0, -1, true); });
 }
 BENCHMARK(BM_DrawIndices);
 
@@ -200,21 +246,20 @@ void BM_GlDrawInstances(benchmark::State& state)
 {
     const Scene scene;
     const GlMesh mesh;
-    int draws = 0;
-    for (auto _ : state)
-    {
-        mesh.SetUpAttributes();
-        glVertexAttribDivisor(0, 0);
-        glVertexAttribDivisor(1, 0);
-        glDrawArraysInstanced(GL_TRIANGLES, 0, 3, 4);
-        for (GLuint location = 0; location < 2; ++location)
-        {
-            glVertexAttribDivisor(location, 0);
-            glDisableVertexAttribArray(location);
-        }
-        glBindBuffer(GL_ARRAY_BUFFER, 0);
-        Scene::Settle(state, draws);
-    }
+    Measure(state,
+            [&]
+            {
+                mesh.SetUpAttributes();
+                glVertexAttribDivisor(0, 0);
+                glVertexAttribDivisor(1, 0);
+                glDrawArraysInstanced(GL_TRIANGLES, 0, 3, 4);
+                for (GLuint location = 0; location < 2; ++location)
+                {
+                    glVertexAttribDivisor(location, 0);
+                    glDisableVertexAttribArray(location);
+                }
+                glBindBuffer(GL_ARRAY_BUFFER, 0);
+            });
 }
 BENCHMARK(BM_GlDrawInstances);
 
@@ -222,12 +267,7 @@ void BM_DrawInstances(benchmark::State& state)
 {
     const Scene scene;
     const Owned<IGraphicsObject> mesh = Mesh();
-    int draws = 0;
-    for (auto _ : state)
-    {
-        mesh->DrawInstanced(0, 3, 4);
-        Scene::Settle(state, draws);
-    }
+    Measure(state, [&] { mesh->DrawInstanced(0, 3, 4); });
 }
 BENCHMARK(BM_DrawInstances);
 

@@ -3,6 +3,8 @@
 
 #include "BenchThread.h"
 
+#include <nib/device.h>
+#include <nib/render_target.h>
 #include <nib/texture.h>
 
 #include <GLES3/gl3.h>
@@ -78,6 +80,16 @@ public:
                         pixels.data());
     }
 
+    void SetData(const Pixels& pixels) const
+    {
+        GLint previous = 0;
+        glGetIntegerv(GL_TEXTURE_BINDING_2D, &previous);
+        glBindTexture(GL_TEXTURE_2D, m_texture);
+        glTexImage2D(GL_TEXTURE_2D, 0, GL_RGBA8, m_side, m_side, 0, GL_RGBA, GL_UNSIGNED_BYTE,
+                     pixels.data());
+        glBindTexture(GL_TEXTURE_2D, static_cast<GLuint>(previous));
+    }
+
 private:
     const GLsizei m_side;
     GLuint m_texture = 0;
@@ -130,7 +142,7 @@ void BM_GlUpdateTexture(benchmark::State& state)
         texture.Update(pixels);
     CountBytes(state);
 }
-BENCHMARK(BM_GlUpdateTexture)->Arg(4)->Arg(256)->Arg(1024);
+BENCHMARK(BM_GlUpdateTexture)->Arg(64)->Arg(256)->Arg(1024);
 
 void BM_UpdateTexture(benchmark::State& state)
 {
@@ -140,7 +152,7 @@ void BM_UpdateTexture(benchmark::State& state)
         texture->Update(pixels.data(), 0);
     CountBytes(state);
 }
-BENCHMARK(BM_UpdateTexture)->Arg(4)->Arg(256)->Arg(1024);
+BENCHMARK(BM_UpdateTexture)->Arg(64)->Arg(256)->Arg(1024);
 
 // With a row length, which asks the driver for the old one; beside BM_UpdateTexture.
 void BM_UpdateTextureWithRowLength(benchmark::State& state)
@@ -151,7 +163,68 @@ void BM_UpdateTextureWithRowLength(benchmark::State& state)
         texture->Update(pixels.data(), static_cast<int>(state.range(0)));
     CountBytes(state);
 }
-BENCHMARK(BM_UpdateTextureWithRowLength)->Arg(4)->Arg(256)->Arg(1024);
+BENCHMARK(BM_UpdateTextureWithRowLength)->Arg(64)->Arg(256)->Arg(1024);
+
+void BM_GlSetData(benchmark::State& state)
+{
+    const Pixels pixels = PixelsOf(state.range(0));
+    const GlTexture texture(state.range(0), pixels);
+    for (auto _ : state)
+        texture.SetData(pixels);
+    CountBytes(state);
+}
+BENCHMARK(BM_GlSetData)->Arg(64)->Arg(1024);
+
+void BM_SetData(benchmark::State& state)
+{
+    const Pixels pixels = PixelsOf(state.range(0));
+    const Owned<ITextureObject> texture = Texture(state.range(0), pixels);
+    for (auto _ : state)
+        texture->SetData(pixels.data(), 0);
+    CountBytes(state);
+}
+BENCHMARK(BM_SetData)->Arg(64)->Arg(1024);
+
+// ---- reading back -------------------------------------------------------------------------------
+
+/// A texture that is drawn into and read from.
+class Page
+{
+public:
+    explicit Page(std::int64_t side)
+        : m_texture(Texture(side, PixelsOf(side))),
+          m_target(RendererFactory::CreateOffscreenRenderTarget(m_texture.get()))
+    {
+        m_target->Activate();
+    }
+
+private:
+    Owned<ITextureObject> m_texture;
+    Owned<IOffscreenRenderTarget> m_target;
+};
+
+void BM_GlReadPixels(benchmark::State& state)
+{
+    const Page page(state.range(0));
+    Pixels pixels = PixelsOf(state.range(0));
+    const auto side = static_cast<GLsizei>(state.range(0));
+    for (auto _ : state)
+        glReadPixels(0, 0, side, side, GL_RGBA, GL_UNSIGNED_BYTE, pixels.data());
+    CountBytes(state);
+}
+BENCHMARK(BM_GlReadPixels)->Arg(64)->Arg(1024);
+
+void BM_ReadPixels(benchmark::State& state)
+{
+    const Page page(state.range(0));
+    Pixels pixels = PixelsOf(state.range(0));
+    const int side = static_cast<int>(state.range(0));
+    for (auto _ : state)
+        OpenGLRenderer::readPixels(0, 0, side, side, pixels.data(), TextureTargetLayout::Rgba,
+                                   TextureMemoryLayout::RGBA8);
+    CountBytes(state);
+}
+BENCHMARK(BM_ReadPixels)->Arg(64)->Arg(1024);
 
 // ---- activations --------------------------------------------------------------------------------
 
