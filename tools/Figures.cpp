@@ -1,5 +1,7 @@
 #include "Figures.h"
 
+#include "Percentile.h"
+
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
@@ -27,22 +29,12 @@ nlohmann::json FrameTimes(const std::vector<float>& times)
     if (times.empty())
         return nullptr;
     constexpr double kMicrosecond = 1.0e3; // of a millisecond
-    return {{"p50", Rounded(Percentile(times, 50), kMicrosecond)},
-            {"p95", Rounded(Percentile(times, 95), kMicrosecond)},
-            {"p99", Rounded(Percentile(times, 99), kMicrosecond)}};
+    return {{"p50", Rounded(Ink::Percentile(times, 50), kMicrosecond)},
+            {"p95", Rounded(Ink::Percentile(times, 95), kMicrosecond)},
+            {"p99", Rounded(Ink::Percentile(times, 99), kMicrosecond)}};
 }
 
 } // namespace
-
-std::optional<float> Percentile(std::vector<float> times, double percent)
-{
-    if (times.empty())
-        return std::nullopt;
-    const double rank = std::ceil(percent / 100.0 * static_cast<double>(times.size()));
-    const auto index = static_cast<std::ptrdiff_t>(std::max(rank, 1.0)) - 1;
-    std::nth_element(times.begin(), times.begin() + index, times.end());
-    return times[static_cast<std::size_t>(index)];
-}
 
 std::string Summary(const Figures& figures)
 {
@@ -51,9 +43,9 @@ std::string Summary(const Figures& figures)
     if (figures.redrawn)
         line += Formatted(", %.2f %% of the pixels redrawn", *figures.redrawn * 100.0);
     if (!figures.frameTimes.empty())
-        line += Formatted(", frame time p50 %.2f p95 %.2f p99 %.2f ms",
-                          *Percentile(figures.frameTimes, 50), *Percentile(figures.frameTimes, 95),
-                          *Percentile(figures.frameTimes, 99));
+        line += Formatted(
+            ", frame time p50 %.2f p95 %.2f p99 %.2f ms", *Ink::Percentile(figures.frameTimes, 50),
+            *Ink::Percentile(figures.frameTimes, 95), *Ink::Percentile(figures.frameTimes, 99));
     line += Formatted(", programs %d compiled %d loaded", figures.programs.compiled,
                       figures.programs.loaded);
     return line;

@@ -20,10 +20,6 @@ struct Figures
     Ink::ProgramCounts programs;
 };
 
-/// The time that @p percent of the frames kept within: the least one for which that holds. Nothing
-/// without frames.
-std::optional<float> Percentile(std::vector<float> times, double percent);
-
 /// One line for people, without its end.
 std::string Summary(const Figures& figures);
 

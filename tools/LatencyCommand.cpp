@@ -1,11 +1,11 @@
 #include "LatencyCommand.h"
 
 #include "DrawOptions.h"
-#include "Figures.h"
 #include "latency/Histogram.h"
 #include "latency/HistogramPicture.h"
 #include "latency/LatencyProbe.h"
 #include "latency/PenProcess.h"
+#include "Percentile.h"
 #include "UserError.h"
 
 #include <algorithm>
@@ -62,8 +62,8 @@ void PrintText(const Measured& measured, PageSize size, int taps)
             std::printf("%-14s not granted: %s\n", series.name.c_str(), series.obstacle.c_str());
         else
             std::printf("%-14s p50 %.2f ms, p99 %.2f ms, %.2f %% of the pixels redrawn a frame\n",
-                        series.name.c_str(), *Percentile(series.times, 50),
-                        *Percentile(series.times, 99), series.redrawnShare * 100.0);
+                        series.name.c_str(), *Ink::Percentile(series.times, 50),
+                        *Ink::Percentile(series.times, 99), series.redrawnShare * 100.0);
 }
 
 void PrintJson(const Measured& measured, PageSize size, int taps)
@@ -74,8 +74,8 @@ void PrintJson(const Measured& measured, PageSize size, int taps)
             paths.push_back({{"name", series.name}, {"obstacle", series.obstacle}});
         else
             paths.push_back({{"name", series.name},
-                             {"p50_ms", *Percentile(series.times, 50)},
-                             {"p99_ms", *Percentile(series.times, 99)},
+                             {"p50_ms", *Ink::Percentile(series.times, 50)},
+                             {"p99_ms", *Ink::Percentile(series.times, 99)},
                              {"redrawn_share", series.redrawnShare}});
     const nlohmann::ordered_json all = {{"taps", taps},
                                         {"width", size.width},

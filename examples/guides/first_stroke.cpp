@@ -13,7 +13,7 @@ struct DrawStroke : ITask // runs on the render thread, which then deletes it
         float ribbon[80][2];       // points on the two edges of the stroke, in turn
         for (int i = 0; i < 80; ++i)
         {
-            const float x = 0.9f * (i / 2 / 19.5f - 1), pressure = 0.5f + 0.4f * x;
+            const float x = 0.9f * ((i - i % 2) / 39.0f - 1), pressure = 0.5f + 0.4f * x;
             ribbon[i][0] = x;
             ribbon[i][1] = 0.6f * std::sin(5 * x) + (i % 2 ? 0.4f : -0.4f) * pressure;
         }

@@ -92,9 +92,9 @@ int main()
     thread->Start();
     // [use]
     Canvas canvas(*thread);
-    std::vector<std::thread> painters;
-    for (int i = 0; i < 4; ++i)
-        painters.emplace_back(
+    std::vector<std::thread> painters(4);
+    for (std::thread& painter : painters)
+        painter = std::thread(
             [&canvas]
             {
                 for (int fill = 0; fill < 100; ++fill)

@@ -35,24 +35,6 @@ Figures WithoutFrames()
     return figures;
 }
 
-TEST(Percentile, IsTheLeastTimeThatSoManyKept)
-{
-    const std::vector<float> times = WithFrames().frameTimes;
-    EXPECT_EQ(Percentile(times, 50), 200.0f);
-    EXPECT_EQ(Percentile(times, 95), 380.0f);
-    EXPECT_EQ(Percentile(times, 99), 396.0f);
-    EXPECT_EQ(Percentile(times, 100), 400.0f);
-    EXPECT_EQ(Percentile(times, 0), 1.0f);
-}
-
-TEST(Percentile, OfAFewFrames)
-{
-    EXPECT_EQ(Percentile({7.0f}, 50), 7.0f);
-    EXPECT_EQ(Percentile({9.0f, 7.0f}, 50), 7.0f);
-    EXPECT_EQ(Percentile({9.0f, 7.0f}, 51), 9.0f);
-    EXPECT_EQ(Percentile({}, 50), std::nullopt);
-}
-
 TEST(Figures, OneLineForPeople)
 {
     EXPECT_EQ(Summary(WithFrames()),

@@ -1,6 +1,6 @@
 #include "latency/Histogram.h"
 
-#include "Figures.h"
+#include "Percentile.h"
 
 #include <algorithm>
 #include <cmath>
@@ -26,7 +26,7 @@ Histogram::Histogram(const std::vector<LatencySeries>& series)
 {
     float reach = 0.001f;
     for (const LatencySeries& one : series)
-        reach = std::max(reach, Percentile(one.times, 99).value_or(0.0f));
+        reach = std::max(reach, Ink::Percentile(one.times, 99).value_or(0.0f));
     m_binWidth = RoundWidth(reach / kMostBins);
     m_binCount = static_cast<int>(reach / m_binWidth) + 1;
     for (const LatencySeries& one : series)

@@ -1,7 +1,7 @@
 #include "latency/HistogramPicture.h"
 
-#include "Figures.h"
 #include "latency/Sheet.h"
+#include "Percentile.h"
 #include "PngFile.h"
 
 #include <algorithm>
@@ -92,13 +92,13 @@ private:
         if (series.times.empty())
             return series.name + ": not granted, " + series.obstacle;
         return series.name + ", " + std::to_string(series.times.size()) + " taps, p50 " +
-               Milliseconds(*Percentile(series.times, 50)) + ", p99 " +
-               Milliseconds(*Percentile(series.times, 99));
+               Milliseconds(*Ink::Percentile(series.times, 50)) + ", p99 " +
+               Milliseconds(*Ink::Percentile(series.times, 99));
     }
 
     void DrawMark(const LatencySeries& series, double percent, int ground)
     {
-        const int x = PlaceOf(*Percentile(series.times, percent));
+        const int x = PlaceOf(*Ink::Percentile(series.times, percent));
         m_sheet.Fill(x, ground - kBarsHeight, 1, kBarsHeight + 5, kMark);
         const std::string label = percent == 50.0 ? "p50" : "p99";
         m_sheet.Write(x - m_sheet.WidthOf(label) / 2, ground + 17, label, kMark);

@@ -1,5 +1,9 @@
 #include "InkView.h"
 
+#include "PostTask.h"
+
+#include <android/log.h>
+
 #include <utility>
 
 namespace
@@ -44,7 +48,7 @@ void InkView::SurfaceChanged(ANativeWindow* window, int width, int height)
         m_session = std::make_unique<Ink::InkSession>(DrawingThread(), width, height, kPaper);
     else if (isResized)
     {
-        m_session->DetachWindow();
+        Detach();
         m_session->Resize(width, height);
         Redraw();
     }
@@ -54,8 +58,15 @@ void InkView::SurfaceChanged(ANativeWindow* window, int width, int height)
 void InkView::SurfaceDestroyed()
 {
     if (IsShown())
-        m_session->DetachWindow();
+        Detach();
     m_window.reset();
+}
+
+void InkView::Detach()
+{
+    Ink::Post(*DrawingThread().GetMsgQueue(), [latency = m_latency] { latency->Forget(); });
+    m_event = 0; // its ink is shown whenever the page is again
+    m_session->DetachWindow();
 }
 
 void InkView::Attach()
@@ -69,7 +80,7 @@ void InkView::Stop()
     if (std::exchange(m_stopped, true) || !m_session)
         return;
     if (m_window)
-        m_session->DetachWindow();
+        Detach();
     if (m_front)
         m_session->Pause(); // a surface thread keeps its context, which costs nothing unused
 }
@@ -92,6 +103,12 @@ void InkView::Start()
 
 // ---- the pen ------------------------------------------------------------------------------------
 
+void InkView::Event(Nib::EglTime time)
+{
+    if (m_event == 0)
+        m_event = time;
+}
+
 void InkView::Pen(Phase phase, const Ink::Sample& sample)
 {
     if (phase == Phase::Down)
@@ -108,6 +125,7 @@ void InkView::Pen(Phase phase, const Ink::Sample& sample)
     {
         m_document.End();
         m_stroke.End();
+        LogLatency();
     }
     Paint();
 }
@@ -126,9 +144,33 @@ void InkView::Clear()
 
 void InkView::Present()
 {
-    if (IsShown())
-        m_session->Present();
+    if (!IsShown())
+        return;
+    MeasureFrame();
+    m_session->Present();
 }
+
+// ---- what it took -------------------------------------------------------------------------------
+
+void InkView::MeasureFrame()
+{
+    const Nib::EglTime event = std::exchange(m_event, 0);
+    if (event == 0 || m_front)
+        return; // nothing new, or nothing that is presented
+    Ink::Post(*m_surface->GetMsgQueue(),
+              [latency = m_latency, event] { latency->BeginFrame(event); });
+}
+
+void InkView::LogLatency()
+{
+    if (m_front)
+        return;
+    Ink::Post(
+        *m_surface->GetMsgQueue(), [latency = m_latency]
+        { __android_log_print(ANDROID_LOG_INFO, "nib_ink", "%s", latency->Summary().c_str()); });
+}
+
+// ---- the page -----------------------------------------------------------------------------------
 
 /// Puts onto the page what the stroke has gained.
 void InkView::Paint()

@@ -1,6 +1,7 @@
 #ifndef NIB_EXAMPLES_ANDROID_INK_VIEW_H
 #define NIB_EXAMPLES_ANDROID_INK_VIEW_H
 
+#include "FrameLatency.h"
 #include "InkDocument.h"
 #include "InkSession.h"
 #include "InkStroke.h"
@@ -37,6 +38,9 @@ public:
     void Stop();  ///< leaves the screen: the page is kept
     void Start(); ///< comes back to the screen
 
+    /// An event of the pen has come, the oldest of its samples at @p time, in nanoseconds since the
+    /// system's start without sleep. Before its samples.
+    void Event(Nib::EglTime time);
     void Pen(Phase phase, const Ink::Sample& sample);
     void Undo();
     void Clear();
@@ -51,8 +55,11 @@ private:
     Nib::RenderThreadGL& DrawingThread() { return m_front ? *m_front : *m_surface; }
     bool IsShown() const { return m_session && m_window && !m_stopped; }
     void Attach();
+    void Detach();
     void Redraw();
     void Paint();
+    void MeasureFrame();
+    void LogLatency();
 
     // Ended from the last to the first: the session before its thread, a child before its parent.
     std::unique_ptr<Nib::RenderThreadGL> m_surface;
@@ -65,6 +72,8 @@ private:
     Ink::InkDocument m_document;
     Ink::BrushStyle m_style = Ink::DefaultStyle(Ink::BrushKind::Pen);
     Ink::InkStroke m_stroke{m_style};
+    Nib::EglTime m_event = 0; // the oldest that no frame shows yet; 0: none
+    std::shared_ptr<Ink::FrameLatency> m_latency = std::make_shared<Ink::FrameLatency>();
 };
 
 #endif

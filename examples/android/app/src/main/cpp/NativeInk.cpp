@@ -18,6 +18,7 @@ namespace
 constexpr float kDegrees = 180.0f / 3.14159265f;
 constexpr float kQuarterTurn = 90.0f;
 constexpr float kTurn = 360.0f;
+constexpr Nib::EglTime kNanosecondsPerMillisecond = 1000000;
 
 // The order of NativeInk.FIELDS.
 enum Field
@@ -104,12 +105,14 @@ extern "C"
 
     JNIEXPORT void JNICALL Java_org_nibrenderer_ink_NativeInk_pen(JNIEnv* env, jobject,
                                                                   jlong handle, jint phase,
-                                                                  jfloatArray samples, jint count)
+                                                                  jfloatArray samples, jint count,
+                                                                  jlong firstEventTime)
     {
         std::vector<float> fields(static_cast<std::size_t>(count) * kFieldCount);
         env->GetFloatArrayRegion(samples, 0, static_cast<jsize>(fields.size()), fields.data());
         if (env->ExceptionCheck() == JNI_TRUE)
             return; // fewer than `count` samples
+        View(handle).Event(firstEventTime * kNanosecondsPerMillisecond);
         for (jint i = 0; i < count; ++i)
         {
             // A batch begins or ends a stroke with its first or its last sample.

@@ -84,7 +84,8 @@ class InkSurfaceView(context: Context, private val ink: NativeInk) :
             count - 1, event.eventTime, event.getX(pointer), event.getY(pointer), event.getPressure(pointer),
             event.getAxisValue(MotionEvent.AXIS_TILT, pointer), event.getOrientation(pointer)
         )
-        ink.pen(phase, samples, count)
+        val firstEventTime = if (event.historySize > 0) event.getHistoricalEventTime(0) else event.eventTime
+        ink.pen(phase, samples, count, firstEventTime)
         askForFrame()
     }
 

@@ -20,8 +20,12 @@ class NativeInk(cacheDirectory: String) : AutoCloseable {
     /** The application is on the screen again. */
     fun start() = start(handle)
 
-    /** The pen came down ([PHASE_DOWN]), moved on or went up. [samples] holds [count] times the [FIELDS] fields. */
-    fun pen(phase: Int, samples: FloatArray, count: Int) = pen(handle, phase, samples, count)
+    /**
+     * The pen came down ([PHASE_DOWN]), moved on or went up. [samples] holds [count] times the [FIELDS] fields; the first of them
+     * came at [firstEventTime], in milliseconds of the clock of events.
+     */
+    fun pen(phase: Int, samples: FloatArray, count: Int, firstEventTime: Long) =
+        pen(handle, phase, samples, count, firstEventTime)
 
     /** Shows what the samples so far have drawn. */
     fun present() = present(handle)
@@ -42,7 +46,7 @@ class NativeInk(cacheDirectory: String) : AutoCloseable {
     private external fun surfaceDestroyed(handle: Long)
     private external fun stop(handle: Long)
     private external fun start(handle: Long)
-    private external fun pen(handle: Long, phase: Int, samples: FloatArray, count: Int)
+    private external fun pen(handle: Long, phase: Int, samples: FloatArray, count: Int, firstEventTime: Long)
     private external fun present(handle: Long)
     private external fun undo(handle: Long)
     private external fun clear(handle: Long)
