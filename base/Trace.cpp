@@ -87,16 +87,15 @@ void Trace::SetListening(unsigned listener, bool isListening)
 void Trace::Write(TraceEvent::Kind kind, const char* category, const char* name,
                   std::initializer_list<TraceArgument> arguments)
 {
-    TraceSinkHolder::Instance().Take({kind, t_thread, t_lane, Now(), category, name,
-                                      0, arguments.begin(), arguments.size()});
+    TraceSinkHolder::Instance().Take(
+        {kind, t_thread, t_lane, Now(), category, name, 0, arguments.begin(), arguments.size()});
 }
 
 void Trace::WriteCounter(const char* category, const char* name, std::int64_t value,
                          std::uint64_t thread, const char* lane)
 {
     const bool isOwn = thread == 0;
-    TraceSinkHolder::Instance().Take({TraceEvent::Kind::Counter,
-                                      isOwn ? t_thread : thread,
+    TraceSinkHolder::Instance().Take({TraceEvent::Kind::Counter, isOwn ? t_thread : thread,
                                       isOwn ? t_lane : lane, Now(), category, name, value, nullptr,
                                       0});
 }

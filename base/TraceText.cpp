@@ -17,8 +17,12 @@ std::size_t CharacterLength(std::string_view text)
 {
     const auto byte = [&](std::size_t index) { return static_cast<unsigned char>(text[index]); };
     const unsigned char first = byte(0);
-    const std::size_t length =
-        first < 0x80 ? 1 : first < 0xC2 ? 0 : first < 0xE0 ? 2 : first < 0xF0 ? 3 : first < 0xF5 ? 4 : 0;
+    const std::size_t length = first < 0x80   ? 1
+                               : first < 0xC2 ? 0
+                               : first < 0xE0 ? 2
+                               : first < 0xF0 ? 3
+                               : first < 0xF5 ? 4
+                                              : 0;
     if (length > text.size())
         return kNotUtf8;
     for (std::size_t index = 1; index < length; ++index)

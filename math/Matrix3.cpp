@@ -1,5 +1,7 @@
 #include <nib/matrix.h>
 
+#include "math/Float4.h"
+
 #include <algorithm>
 #include <cmath>
 #include <cstring>
@@ -16,36 +18,104 @@ namespace
 
 constexpr float kRadiansPerDegree = 0.017453292f;
 
-template <typename T>
-Matrix3<T> Product(const Matrix3<T>& a, const Matrix3<T>& b)
+/// The three columns; the fourth lanes are those of m3, m3 and m8.
+struct Columns
 {
-    Matrix3<T> product;
-    for (int column = 0; column < 9; column += 3)
+    explicit Columns(const float* m)
+        : first(Load(m)), second(Pick<3, 4, 5, 3>(Load(m), Load(m + 4))),
+          third(Pick<2, 3, 4, 4>(Load(m + 4), All(m[8])))
     {
-        for (int row = 0; row < 3; ++row)
-            product[column + row] =
-                a[row] * b[column] + a[3 + row] * b[column + 1] + a[6 + row] * b[column + 2];
     }
-    return product;
+
+    Float4 first, second, third;
+};
+
+/// Column by column: element 3j + i is a(i) b(3j) + a(3 + i) b(3j + 1) + a(6 + i) b(3j + 2).
+void Multiply(const float* a, const float* b, float* product)
+{
+    const Columns left(a);
+    const Float4 b0 = Load(b), b4 = Load(b + 4), b8 = All(b[8]);
+    const Float4 first = left.first * Pick<0, 0, 0, 0>(b0) + left.second * Pick<1, 1, 1, 1>(b0) +
+                         left.third * Pick<2, 2, 2, 2>(b0);
+    const Float4 second = left.first * Pick<3, 3, 3, 3>(b0) + left.second * Pick<0, 0, 0, 0>(b4) +
+                          left.third * Pick<1, 1, 1, 1>(b4);
+    const Float4 third =
+        left.first * Pick<2, 2, 2, 2>(b4) + left.second * Pick<3, 3, 3, 3>(b4) + left.third * b8;
+    Store(product, Pick<0, 1, 4, 6>(first, Pick<2, 2, 4, 4>(first, second)));
+    Store(product + 4, Pick<1, 2, 4, 5>(second, third));
+    product[8] = third[2];
 }
 
-template <typename T>
-Vector2<T> MapPoint(const Matrix3<T>& m, T x, T y)
+/// The cofactors a(0) to a(8). Those of one row of the adjugate are the cross product of two
+/// columns.
+struct Adjugate3
 {
-    const T w = m[2] * x + m[5] * y + m[8];
-    return {(m[0] * x + m[3] * y + m[6]) / w, (m[1] * x + m[4] * y + m[7]) / w};
+    explicit Adjugate3(const Columns& c)
+    {
+        const Float4 row0 = Cross(c.second, c.third); // a0 a3 a6
+        const Float4 row1 = Cross(c.third, c.first);  // a1 a4 a7
+        const Float4 row2 = Cross(c.first, c.second); // a2 a5 a8
+        a0134 = Pick<0, 4, 1, 5>(row0, row1);
+        a6725 = Pick<0, 1, 4, 5>(Pick<2, 6, 3, 7>(row0, row1), row2);
+        a8 = row2[2];
+    }
+
+    static Float4 Cross(Float4 a, Float4 b)
+    {
+        return Pick<1, 2, 0, 0>(a) * Pick<2, 0, 1, 1>(b) -
+               Pick<2, 0, 1, 1>(a) * Pick<1, 2, 0, 0>(b);
+    }
+
+    Float4 a0134, a6725;
+    float a8;
+};
+
+/// Writes the inverse, which may take the place of the matrix; a copy, for a singular matrix.
+void Invert(const float* m, float* inverse)
+{
+    const Columns columns(m);
+    const Adjugate3 adjugate(columns);
+    const Double4 a0134(adjugate.a0134), a6725(adjugate.a6725);
+    const double determinant = a0134.low[0] * m[0] + a0134.low[1] * m[3] + a6725.high[0] * m[6];
+    if (determinant == 0.0)
+    {
+        std::memmove(inverse, m, 9 * sizeof *m);
+        return;
+    }
+    const double factor = 1.0 / determinant;
+    const Float4 b0134 = Scaled(a0134, factor);
+    const Float4 b6725 = Scaled(a6725, factor);
+    Store(inverse, Pick<0, 1, 4, 6>(b0134, Pick<2, 2, 6, 6>(b6725, b0134)));
+    Store(inverse + 4, Pick<0, 2, 4, 5>(Pick<3, 3, 7, 7>(b0134, b6725), b6725));
+    inverse[8] = static_cast<float>(factor * adjugate.a8);
 }
 
-template <typename T>
-RectF MapBounds(const Matrix3<T>& m, const RectF& src)
+/// Two mapped corners, x and y of each.
+Float4 Corners(Float4 a, Float4 b)
 {
+    return Pick<0, 1, 4, 5>(a, b) / Pick<2, 2, 6, 6>(a, b);
+}
+
+static_assert(sizeof(RectF) == sizeof(Float4), "a rectangle fills a register");
+
+/// What RectF::Set with the first corner and RectF::MakeRect with the others give.
+RectF MapBounds(const float* m, const RectF& src)
+{
+    const Columns c(m);
+    const Float4 edges = Load(&src);
+    const Float4 left = c.first * Pick<0, 0, 0, 0>(edges);
+    const Float4 top = c.second * Pick<1, 1, 1, 1>(edges);
+    const Float4 right = c.first * Pick<2, 2, 2, 2>(edges);
+    const Float4 bottom = c.second * Pick<3, 3, 3, 3>(edges);
+    const Float4 first = Corners(left + top + c.third, right + bottom + c.third);
+    const Float4 second = Pick<2, 3, 2, 3>(first);
+    const Float4 third = Corners(right + top + c.third, left + bottom + c.third);
+    const Float4 fourth = Pick<2, 3, 2, 3>(third);
+
+    const Float4 low = Smaller(Smaller(Smaller(first, second), third), fourth);
+    const Float4 high = Greater(Greater(Greater(first, second), third), fourth);
     RectF bounds;
-    const Vector2<T> first = MapPoint(m, src.left, src.top);
-    bounds.Set(first.x, first.y, first.x, first.y);
-    for (const Vector2<T>& corner :
-         {MapPoint(m, src.right, src.bottom), MapPoint(m, src.right, src.top),
-          MapPoint(m, src.left, src.bottom)})
-        bounds.MakeRect(corner.x, corner.y);
+    Store(&bounds, Pick<0, 1, 4, 5>(low, high));
     return bounds;
 }
 
@@ -165,13 +235,15 @@ Matrix3<T>& Matrix3<T>::setTranslate(T tx, T ty)
 template <typename T>
 Matrix3<T>& Matrix3<T>::preConcat(const Matrix3& other)
 {
-    return *this = Product(*this, other);
+    Multiply(m_elements, other.m_elements, m_elements);
+    return *this;
 }
 
 template <typename T>
 Matrix3<T>& Matrix3<T>::postConcat(const Matrix3& other)
 {
-    return *this = Product(other, *this);
+    Multiply(other.m_elements, m_elements, m_elements);
+    return *this;
 }
 
 template <typename T>
@@ -277,22 +349,16 @@ void Matrix3<T>::calculateMatrix(double* out) const
 template <typename T>
 Matrix3<T>& Matrix3<T>::inverseSelf()
 {
-    double adjugate[9];
-    calculateMatrix(adjugate);
-    const double determinant =
-        adjugate[0] * m_elements[0] + adjugate[1] * m_elements[3] + adjugate[2] * m_elements[6];
-    if (determinant == 0.0)
-        return *this;
-    const double inverse = 1.0 / determinant;
-    for (int i = 0; i < 9; ++i)
-        m_elements[i] = static_cast<T>(inverse * adjugate[i]);
+    Invert(m_elements, m_elements);
     return *this;
 }
 
 template <typename T>
 Matrix3<T> Matrix3<T>::inverse() const
 {
-    return Matrix3(*this).inverseSelf();
+    Matrix3 inverse(m_elements);
+    Invert(m_elements, inverse.m_elements);
+    return inverse;
 }
 
 // ---- mapping ----
@@ -300,15 +366,15 @@ Matrix3<T> Matrix3<T>::inverse() const
 template <typename T>
 void Matrix3<T>::mapRect(RectF* dst, const RectF& src) const
 {
-    *dst = MapBounds(*this, src);
+    *dst = MapBounds(m_elements, src);
 }
 
 template <typename T>
 void Matrix3<T>::mapRect(Rect* dst, const Rect& src) const
 {
     RectF bounds =
-        MapBounds(*this, RectF(static_cast<float>(src.left), static_cast<float>(src.top),
-                               static_cast<float>(src.right), static_cast<float>(src.bottom)));
+        MapBounds(m_elements, RectF(static_cast<float>(src.left), static_cast<float>(src.top),
+                                    static_cast<float>(src.right), static_cast<float>(src.bottom)));
     bounds.ExtendRect();
     *dst = bounds;
 }

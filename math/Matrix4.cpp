@@ -1,5 +1,7 @@
 #include <nib/matrix.h>
 
+#include "math/Float4.h"
+
 #include <algorithm>
 #include <cmath>
 #include <cstring>
@@ -35,6 +37,100 @@ void SetColumn(Matrix4<T>& m, int column, const Vector3<T>& value)
     m(0, column) = value.x;
     m(1, column) = value.y;
     m(2, column) = value.z;
+}
+
+/// Column by column: element 4j + i is a(i) b(4j) + a(4 + i) b(4j + 1) + a(8 + i) b(4j + 2) +
+/// a(12 + i) b(4j + 3).
+void Multiply(const float* a, const float* b, float* product)
+{
+    const Float4 a0 = Load(a), a4 = Load(a + 4), a8 = Load(a + 8), a12 = Load(a + 12);
+    const auto column = [&](Float4 by)
+    {
+        return a0 * Pick<0, 0, 0, 0>(by) + a4 * Pick<1, 1, 1, 1>(by) + a8 * Pick<2, 2, 2, 2>(by) +
+               a12 * Pick<3, 3, 3, 3>(by);
+    };
+    const Float4 b0 = Load(b), b4 = Load(b + 4), b8 = Load(b + 8), b12 = Load(b + 12);
+    Store(product, column(b0));
+    Store(product + 4, column(b4));
+    Store(product + 8, column(b8));
+    Store(product + 12, column(b12));
+}
+
+/// A row of a matrix for the cofactor expansion, which takes from it one factor for each of the
+/// four columns j that it leaves out: from the first, the second and the third of the columns
+/// that remain.
+struct Row
+{
+    explicit Row(Float4 row)
+        : first(Pick<1, 0, 0, 0>(row)), second(Pick<2, 2, 1, 1>(row)), third(Pick<3, 3, 3, 2>(row))
+    {
+    }
+
+    Float4 first, second, third;
+};
+
+/// The products of the factors of two rows, by the columns that these come from.
+struct Products
+{
+    Products(const Row& a, const Row& b)
+        : p12(a.first * b.second), p13(a.first * b.third), p21(a.second * b.first),
+          p23(a.second * b.third), p31(a.third * b.first), p32(a.third * b.second)
+    {
+    }
+
+    Float4 p12, p13, p21, p23, p31, p32;
+};
+
+/// The cofactors of one row, each the sum of six terms in the order of the columns that they
+/// take. The sign of a cofactor is that of the last row's elements: negation is exact.
+Float4 Cofactors(const Products& p, Float4 lastRow, Float4 signs)
+{
+    const Row last(lastRow);
+    const Float4 first = Flip(last.first, signs), second = Flip(last.second, signs),
+                 third = Flip(last.third, signs);
+    return p.p12 * third - p.p13 * second - p.p21 * third + p.p23 * first + p.p31 * second -
+           p.p32 * first;
+}
+
+/// The cofactors in the order of storage: those of row 0 first.
+struct Adjugate4
+{
+    explicit Adjugate4(const float* m)
+    {
+        const Float4 c0 = Load(m), c1 = Load(m + 4), c2 = Load(m + 8), c3 = Load(m + 12);
+        const Float4 low01 = Pick<0, 4, 1, 5>(c0, c1), high01 = Pick<2, 6, 3, 7>(c0, c1);
+        const Float4 low23 = Pick<0, 4, 1, 5>(c2, c3), high23 = Pick<2, 6, 3, 7>(c2, c3);
+        row0 = Pick<0, 1, 4, 5>(low01, low23);
+        const Float4 row1 = Pick<2, 3, 6, 7>(low01, low23);
+        const Float4 row2 = Pick<0, 1, 4, 5>(high01, high23);
+        const Float4 row3 = Pick<2, 3, 6, 7>(high01, high23);
+
+        const Float4 even = {0.0f, -0.0f, 0.0f, -0.0f}, odd = {-0.0f, 0.0f, -0.0f, 0.0f};
+        const Row first(row0), second(row1), third(row2);
+        columns[0] = Cofactors(Products(second, third), row3, even);
+        columns[1] = Cofactors(Products(first, third), row3, odd);
+        const Products upper(first, second);
+        columns[2] = Cofactors(upper, row3, even);
+        columns[3] = Cofactors(upper, row2, odd);
+    }
+
+    Float4 row0; ///< of the matrix
+    Float4 columns[4];
+};
+
+/// Writes the inverse and returns true; false, and nothing written, for a singular matrix.
+bool Invert(const float* m, float* inverse)
+{
+    const Adjugate4 adjugate(m);
+    const Double4 a(adjugate.row0), b(adjugate.columns[0]);
+    const Double2 low = a.low * b.low, high = a.high * b.high;
+    const double determinant = low[0] + low[1] + high[0] + high[1];
+    if (determinant == 0.0)
+        return false;
+    const double factor = 1.0 / determinant;
+    for (int column = 0; column < 4; ++column)
+        Store(inverse + 4 * column, Scaled(Double4(adjugate.columns[column]), factor));
+    return true;
 }
 
 } // namespace
@@ -220,6 +316,22 @@ Matrix4<T> Matrix4<T>::rotate(T x, T y, T z) const
     return translation().rotateSelf(x, y, z);
 }
 
+// ---- combining ----
+
+template <typename T>
+Matrix4<T>& Matrix4<T>::preConcat(const Matrix4& other)
+{
+    Multiply(m_elements, other.m_elements, m_elements);
+    return *this;
+}
+
+template <typename T>
+Matrix4<T>& Matrix4<T>::postConcat(const Matrix4& other)
+{
+    Multiply(other.m_elements, m_elements, m_elements);
+    return *this;
+}
+
 // ---- parts ----
 
 template <typename T>
@@ -268,64 +380,27 @@ Matrix4<T> Matrix4<T>::transpose() const
     return Matrix4(*this).transposeSelf();
 }
 
-// The cofactor expansion: each term takes one factor from each remaining row, in the order of the
-// rows; the terms stand in the order of the columns that they take.
 template <typename T>
 void Matrix4<T>::calculaeMatrix(double* out) const
 {
-    const T* const m = m_elements;
-    out[0] = m[5] * m[10] * m[15] - m[5] * m[14] * m[11] - m[9] * m[6] * m[15] +
-             m[9] * m[14] * m[7] + m[13] * m[6] * m[11] - m[13] * m[10] * m[7];
-    out[1] = -m[1] * m[10] * m[15] + m[1] * m[14] * m[11] + m[9] * m[2] * m[15] -
-             m[9] * m[14] * m[3] - m[13] * m[2] * m[11] + m[13] * m[10] * m[3];
-    out[2] = m[1] * m[6] * m[15] - m[1] * m[14] * m[7] - m[5] * m[2] * m[15] + m[5] * m[14] * m[3] +
-             m[13] * m[2] * m[7] - m[13] * m[6] * m[3];
-    out[3] = -m[1] * m[6] * m[11] + m[1] * m[10] * m[7] + m[5] * m[2] * m[11] -
-             m[5] * m[10] * m[3] - m[9] * m[2] * m[7] + m[9] * m[6] * m[3];
-    out[4] = -m[4] * m[10] * m[15] + m[4] * m[14] * m[11] + m[8] * m[6] * m[15] -
-             m[8] * m[14] * m[7] - m[12] * m[6] * m[11] + m[12] * m[10] * m[7];
-    out[5] = m[0] * m[10] * m[15] - m[0] * m[14] * m[11] - m[8] * m[2] * m[15] +
-             m[8] * m[14] * m[3] + m[12] * m[2] * m[11] - m[12] * m[10] * m[3];
-    out[6] = -m[0] * m[6] * m[15] + m[0] * m[14] * m[7] + m[4] * m[2] * m[15] -
-             m[4] * m[14] * m[3] - m[12] * m[2] * m[7] + m[12] * m[6] * m[3];
-    out[7] = m[0] * m[6] * m[11] - m[0] * m[10] * m[7] - m[4] * m[2] * m[11] + m[4] * m[10] * m[3] +
-             m[8] * m[2] * m[7] - m[8] * m[6] * m[3];
-    out[8] = m[4] * m[9] * m[15] - m[4] * m[13] * m[11] - m[8] * m[5] * m[15] +
-             m[8] * m[13] * m[7] + m[12] * m[5] * m[11] - m[12] * m[9] * m[7];
-    out[9] = -m[0] * m[9] * m[15] + m[0] * m[13] * m[11] + m[8] * m[1] * m[15] -
-             m[8] * m[13] * m[3] - m[12] * m[1] * m[11] + m[12] * m[9] * m[3];
-    out[10] = m[0] * m[5] * m[15] - m[0] * m[13] * m[7] - m[4] * m[1] * m[15] +
-              m[4] * m[13] * m[3] + m[12] * m[1] * m[7] - m[12] * m[5] * m[3];
-    out[11] = -m[0] * m[5] * m[11] + m[0] * m[9] * m[7] + m[4] * m[1] * m[11] - m[4] * m[9] * m[3] -
-              m[8] * m[1] * m[7] + m[8] * m[5] * m[3];
-    out[12] = -m[4] * m[9] * m[14] + m[4] * m[13] * m[10] + m[8] * m[5] * m[14] -
-              m[8] * m[13] * m[6] - m[12] * m[5] * m[10] + m[12] * m[9] * m[6];
-    out[13] = m[0] * m[9] * m[14] - m[0] * m[13] * m[10] - m[8] * m[1] * m[14] +
-              m[8] * m[13] * m[2] + m[12] * m[1] * m[10] - m[12] * m[9] * m[2];
-    out[14] = -m[0] * m[5] * m[14] + m[0] * m[13] * m[6] + m[4] * m[1] * m[14] -
-              m[4] * m[13] * m[2] - m[12] * m[1] * m[6] + m[12] * m[5] * m[2];
-    out[15] = m[0] * m[5] * m[10] - m[0] * m[9] * m[6] - m[4] * m[1] * m[10] + m[4] * m[9] * m[2] +
-              m[8] * m[1] * m[6] - m[8] * m[5] * m[2];
+    const Adjugate4 adjugate(m_elements);
+    for (int i = 0; i < 16; ++i)
+        out[i] = adjugate.columns[i / 4][i % 4];
 }
 
 template <typename T>
 Matrix4<T>& Matrix4<T>::inverseSelf()
 {
-    double adjugate[16];
-    calculaeMatrix(adjugate);
-    const double determinant = m_elements[0] * adjugate[0] + m_elements[4] * adjugate[1] +
-                               m_elements[8] * adjugate[2] + m_elements[12] * adjugate[3];
-    if (determinant == 0.0)
-        return *this;
-    for (int i = 0; i < 16; ++i)
-        m_elements[i] = static_cast<T>(adjugate[i] * (1.0 / determinant));
+    Invert(m_elements, m_elements);
     return *this;
 }
 
 template <typename T>
 Matrix4<T> Matrix4<T>::inverse() const
 {
-    return Matrix4(*this).inverseSelf();
+    Matrix4 inverse(*this);
+    Invert(m_elements, inverse.m_elements);
+    return inverse;
 }
 
 template class Matrix4<float>;

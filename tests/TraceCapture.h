@@ -110,8 +110,7 @@ private:
         {
         case Nib::TraceEvent::Kind::Begin: return "+" + event.name;
         case Nib::TraceEvent::Kind::End: return "-";
-        case Nib::TraceEvent::Kind::Counter:
-            return event.name + "=" + std::to_string(event.value);
+        case Nib::TraceEvent::Kind::Counter: return event.name + "=" + std::to_string(event.value);
         case Nib::TraceEvent::Kind::Instant: break;
         }
         return "!" + event.name;

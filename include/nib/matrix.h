@@ -196,6 +196,9 @@ public:
     /// Rx(x) * Ry(y) * Rz(z) with this matrix's translation.
     Matrix4 rotate(T x, T y, T z) const;
 
+    Matrix4& preConcat(const Matrix4& other);  ///< this * other
+    Matrix4& postConcat(const Matrix4& other); ///< other * this
+
     Vector4<T> row(int i) const;    ///< i from 0 to 3
     Vector4<T> column(int j) const; ///< j from 0 to 3
     Matrix4 rotation() const;       ///< a copy without the translation

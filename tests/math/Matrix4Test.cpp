@@ -298,6 +298,41 @@ TEST(Matrix4, ABasisOfParallelVectorsIsNotFinite)
     EXPECT_EQ(m[8], 1);
 }
 
+// ---- combining ----
+
+TEST(Matrix4, PreConcatActsOnPointsFirst)
+{
+    Values values;
+    for (int i = 0; i < kRandomCases; ++i)
+    {
+        const Mat4 m = values.NextMatrix4();
+        const Mat4 other = values.NextMatrix4();
+        EXPECT_TRUE(IsNear(Mat4(m).preConcat(other), ToEigen(m) * ToEigen(other), 400));
+    }
+}
+
+TEST(Matrix4, PostConcatActsOnPointsLast)
+{
+    Values values;
+    for (int i = 0; i < kRandomCases; ++i)
+    {
+        const Mat4 m = values.NextMatrix4();
+        const Mat4 other = values.NextMatrix4();
+        EXPECT_TRUE(IsNear(Mat4(m).postConcat(other), ToEigen(other) * ToEigen(m), 400));
+    }
+}
+
+TEST(Matrix4, MayBeCombinedWithItself)
+{
+    Mat4 m(kCounted);
+    EXPECT_EQ(&m.preConcat(m), &m);
+    EXPECT_TRUE(HasElements(
+        m, {56, 62, 68, 74, 152, 174, 196, 218, 248, 286, 324, 362, 344, 398, 452, 506}));
+    Mat4 n(kCounted);
+    EXPECT_EQ(&n.postConcat(n), &n);
+    EXPECT_EQ(n, m);
+}
+
 // ---- turning round ----
 
 TEST(Matrix4, Transposes)

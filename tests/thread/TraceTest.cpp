@@ -1,10 +1,10 @@
 // What workers tell a trace.
 
-#include "TraceCapture.h"
 #include "sim/SimDriver.h"
 #include "thread/InstructionCount.h"
 #include "thread/TaskScope.h"
 #include "thread/ThreadTestSupport.h"
+#include "TraceCapture.h"
 
 #include <gtest/gtest.h>
 
