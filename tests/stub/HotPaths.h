@@ -85,7 +85,7 @@ void SetData(HotScene& scene, int times); ///< of a texture
 void GlReadPixels(HotScene& scene, int times);
 void ReadPixels(HotScene& scene, int times);
 void GlPresent(HotScene& scene, int times);
-void Present(HotScene& scene, int times);  ///< UseRect, Reset, DoSwapBuffers
+void Present(HotScene& scene, int times); ///< UseRect, Reset, DoSwapBuffers
 void GlProgram(HotScene& scene, int times);
 void Program(HotScene& scene, int times);  ///< made from a binary in memory, and released
 void Filtered(HotScene& scene, int times); ///< a log line that nobody wants to see
