@@ -54,6 +54,7 @@ TEST(Allocations, PixelsReadBackMakeNone)
 TEST(Allocations, AFramePresentedInPartMakesNone)
 {
     EXPECT_EQ(AllocationsOf(&HotPaths::Present), 0);
+    EXPECT_EQ(AllocationsOf(&HotPaths::TiledPresent), 0);
 }
 
 TEST(Allocations, ALogLineThatNobodyWantsMakesNone)

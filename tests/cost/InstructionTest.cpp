@@ -100,7 +100,8 @@ TEST_F(Cost, OfEachHotPathIsFewInstructions)
     EXPECT_LE(Own("Update"), 60);
     EXPECT_LE(Own("SetData"), 100);
     EXPECT_LE(Own("ReadPixels"), 25);
-    EXPECT_LE(Own("Present"), 270);
+    EXPECT_LE(Own("Present"), 290);
+    EXPECT_LE(Own("TiledPresent"), 750);
     EXPECT_LE(Own("Program"), 1900);
     EXPECT_LE(Of("Filtered"), 40);
 }

@@ -8,16 +8,29 @@
 
 #include <EGL/egl.h>
 #include <EGL/eglext.h>
+#include <GLES2/gl2ext.h>
 
 #include <cstddef>
 
 using namespace Nib;
+
+namespace Nib
+{
+
+/// The way to a mode that this driver would not choose.
+struct UpdateRectangleModes
+{
+    static void Set(UpdateRectangle& rectangle, unsigned mode) { rectangle.m_mode = mode; }
+};
+
+} // namespace Nib
 
 namespace
 {
 
 constexpr int kSide = 64;     // of the page and the texture, in pixels
 constexpr int kScreen = 1000; // side
+constexpr unsigned kTiledRendering = 0x25;
 
 constexpr const char* kVertexShader =
     "attribute vec2 a_position;\n"
@@ -103,6 +116,9 @@ HotScene::HotScene()
 
     m_screen = std::make_unique<EglSurface>(eglGetCurrentSurface(EGL_DRAW));
     update.Init(m_screen.get(), kScreen, kScreen);
+    UpdateRectangleModes::Set(tiled, kTiledRendering);
+    tiled.InitClipRect();
+    tiled.Init(m_screen.get(), kScreen, kScreen);
 }
 
 HotScene::~HotScene()
@@ -337,15 +353,51 @@ void GlPresent(HotScene&, int times)
     }
 }
 
-void Present(HotScene& scene, int times)
+void GlTiledPresent(HotScene&, int times)
+{
+    static const auto start = EntryPoint<PFNGLSTARTTILINGQCOMPROC>("glStartTilingQCOM");
+    static const auto end = EntryPoint<PFNGLENDTILINGQCOMPROC>("glEndTilingQCOM");
+    constexpr GLenum kDropped[] = {GL_DEPTH, GL_STENCIL};
+    const EGLDisplay display = eglGetDisplay(EGL_DEFAULT_DISPLAY);
+    const EGLSurface surface = eglGetCurrentSurface(EGL_DRAW);
+    for (; times != 0; --times)
+    {
+        EGLint age = 0;
+        GLint framebuffer = 0;
+        glBindFramebuffer(GL_FRAMEBUFFER, 0);
+        eglQuerySurface(display, surface, EGL_BUFFER_AGE_EXT, &age);
+        start(100, 740, 200, 60, 0);
+        end(GL_COLOR_BUFFER_BIT0_QCOM);
+        glGetIntegerv(GL_FRAMEBUFFER_BINDING, &framebuffer);
+        glInvalidateFramebuffer(GL_FRAMEBUFFER, 2, kDropped);
+        eglSwapBuffers(display, surface);
+    }
+}
+
+namespace
+{
+
+void PresentWith(UpdateRectangle& update, int times)
 {
     const RectF dirty(100, 200, 300, 260);
     for (; times != 0; --times)
     {
-        scene.update.UseRect(dirty, 0);
-        scene.update.Reset();
-        scene.update.DoSwapBuffers();
+        update.UseRect(dirty, 0);
+        update.Reset();
+        update.DoSwapBuffers();
     }
+}
+
+} // namespace
+
+void Present(HotScene& scene, int times)
+{
+    PresentWith(scene.update, times);
+}
+
+void TiledPresent(HotScene& scene, int times)
+{
+    PresentWith(scene.tiled, times);
 }
 
 // ---- a program ----------------------------------------------------------------------------------

@@ -44,7 +44,8 @@ public:
     Owned<Nib::IGraphicsObject> mesh;
     Owned<Nib::ITextureObject> texture;
     Nib::OpenGLRenderer::OpenGlState state;
-    Nib::UpdateRectangle update;
+    Nib::UpdateRectangle update; ///< presents a part of the window
+    Nib::UpdateRectangle tiled;  ///< draws a part of the window, where the GPU renders in tiles
 
     // The same in GL's own names.
     GLuint glProgram = 0;
@@ -86,6 +87,8 @@ void GlReadPixels(HotScene& scene, int times);
 void ReadPixels(HotScene& scene, int times);
 void GlPresent(HotScene& scene, int times);
 void Present(HotScene& scene, int times); ///< UseRect, Reset, DoSwapBuffers
+void GlTiledPresent(HotScene& scene, int times);
+void TiledPresent(HotScene& scene, int times); ///< the same in tiles
 void GlProgram(HotScene& scene, int times);
 void Program(HotScene& scene, int times);  ///< made from a binary in memory, and released
 void Filtered(HotScene& scene, int times); ///< a log line that nobody wants to see
@@ -99,6 +102,7 @@ inline constexpr HotPath kHotPaths[] = {
     {"SetData", &HotPaths::GlSetData, &HotPaths::SetData},
     {"ReadPixels", &HotPaths::GlReadPixels, &HotPaths::ReadPixels},
     {"Present", &HotPaths::GlPresent, &HotPaths::Present},
+    {"TiledPresent", &HotPaths::GlTiledPresent, &HotPaths::TiledPresent},
     {"Program", &HotPaths::GlProgram, &HotPaths::Program},
     {"Filtered", nullptr, &HotPaths::Filtered},
 };

@@ -1,5 +1,6 @@
 #include <EGL/egl.h>
 #include <EGL/eglext.h>
+#include <GLES3/gl3.h>
 
 #include <cstring>
 
@@ -20,6 +21,28 @@ EGLBoolean PostSubBuffer(EGLDisplay, EGLSurface, EGLint, EGLint, EGLint, EGLint)
 {
     return EGL_TRUE;
 }
+
+void StartTiling(GLuint, GLuint, GLuint, GLuint, GLbitfield) {}
+
+void EndTiling(GLbitfield) {}
+
+struct EntryPoint
+{
+    const char* name;
+    __eglMustCastToProperFunctionPointerType address;
+};
+
+template <typename Function>
+EntryPoint Entry(const char* name, Function* function)
+{
+    return {name, reinterpret_cast<__eglMustCastToProperFunctionPointerType>(function)};
+}
+
+const EntryPoint kEntryPoints[] = {
+    Entry("eglPostSubBufferNV", &PostSubBuffer),
+    Entry("glStartTilingQCOM", &StartTiling),
+    Entry("glEndTilingQCOM", &EndTiling),
+};
 
 } // namespace
 
@@ -124,8 +147,11 @@ extern "C"
     }
     __eglMustCastToProperFunctionPointerType eglGetProcAddress(const char* name)
     {
-        return std::strcmp(name, "eglPostSubBufferNV") == 0
-                   ? reinterpret_cast<__eglMustCastToProperFunctionPointerType>(&PostSubBuffer)
-                   : nullptr;
+        for (const EntryPoint& entry : kEntryPoints)
+        {
+            if (std::strcmp(name, entry.name) == 0)
+                return entry.address;
+        }
+        return nullptr;
     }
 }

@@ -46,8 +46,9 @@ extern "C"
     {
         const char* text = name == GL_VERSION                    ? "OpenGL ES 3.0 stub"
                            : name == GL_SHADING_LANGUAGE_VERSION ? "OpenGL ES GLSL ES 3.00"
-                           : name == GL_EXTENSIONS               ? "GL_OES_element_index_uint"
-                                                                 : "stub";
+                           : name == GL_EXTENSIONS
+                               ? "GL_OES_element_index_uint GL_QCOM_tiled_rendering"
+                               : "stub";
         return reinterpret_cast<const GLubyte*>(text);
     }
     void glGetIntegerv(GLenum name, GLint* value)
