@@ -27,7 +27,7 @@ find_program(NIB_CCACHE ccache)
 if(NIB_CCACHE AND NOT CMAKE_CXX_COMPILER_LAUNCHER)
     # Paths relative to the source tree, so that two checkouts share their objects.
     set(CMAKE_CXX_COMPILER_LAUNCHER
-        ${CMAKE_COMMAND} -E env CCACHE_BASEDIR=${CMAKE_SOURCE_DIR} CCACHE_NOHASHDIR=1 ${NIB_CCACHE})
+        ${CMAKE_COMMAND} -E env CCACHE_BASEDIR=${CMAKE_CURRENT_SOURCE_DIR} CCACHE_NOHASHDIR=1 ${NIB_CCACHE})
 endif()
 
 # Warnings, and the floating-point rule: no fused multiply-add, so that results are the same on every

@@ -91,12 +91,14 @@ elseif(STEP STREQUAL "pkg_config")
 
 elseif(STEP STREQUAL "subdirectory")
     file(REMOVE_RECURSE ${WORK})
-    run(${CMAKE_COMMAND} -S ${CONSUMER} -B ${WORK} -G ${GENERATOR} -DCMAKE_CXX_FLAGS=-O0
+    # As deep as the port's build, whose objects are the same.
+    set(build ${WORK}/build)
+    run(${CMAKE_COMMAND} -S ${CONSUMER} -B ${build} -G ${GENERATOR} -DCMAKE_CXX_FLAGS=-O0
         -DCMAKE_CXX_COMPILER=${COMPILER} -DNIB_SOURCE=${SOURCE})
-    run(${CMAKE_COMMAND} --build ${WORK})
-    run_consumers(${WORK})
+    run(${CMAKE_COMMAND} --build ${build})
+    run_consumers(${build})
     # The tree inside another build adds the libraries, not its tests and tools.
-    if(EXISTS ${WORK}/NibRenderer/tests OR EXISTS ${WORK}/NibRenderer/tools)
+    if(EXISTS ${build}/NibRenderer/tests OR EXISTS ${build}/NibRenderer/tools)
         message(FATAL_ERROR "tests or tools are built within another project")
     endif()
 
