@@ -9,6 +9,8 @@ Ink::Recording ReadRecordings(const std::vector<std::string>& files)
     for (const std::string& file : files)
     {
         Ink::Recording one = Ink::ReadRecording(file);
+        if (one.strokes.empty())
+            continue; // an empty page
         const double shift = end - one.strokes.front().front().time;
         for (Ink::Stroke& stroke : one.strokes)
         {

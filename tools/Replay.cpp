@@ -117,7 +117,8 @@ Figures Replayer::Finish()
 Figures Replay(Ink::InkSession& session, const Ink::Recording& recording,
                const Ink::Placement& placement, const Ink::BrushStyle& style, const Pace& pace)
 {
-    Replayer replayer(session, pace, recording.strokes.front().front().time);
+    const bool isEmpty = recording.strokes.empty();
+    Replayer replayer(session, pace, isEmpty ? 0.0 : recording.strokes.front().front().time);
     for (const Ink::Stroke& stroke : recording.strokes)
         if (!replayer.DrawStroke(stroke, placement, style))
             break;

@@ -64,7 +64,8 @@ public:
             Fail(root.offset_debug(), "not InkML: the outermost element is not <ink>");
         CollectFormats(root);
         CollectTraces(root);
-        if (m_recording.strokes.empty())
+        // An empty page says what its traces would be like; anything else is no page.
+        if (m_recording.strokes.empty() && m_formatsByNode.empty())
             Fail(root.offset_debug(), "there is no trace in it");
         ScalePressures(m_recording);
         return std::move(m_recording);

@@ -24,6 +24,8 @@ Placement FitToPage(const Recording& recording, int width, int height)
             top = std::min(top, sample.y);
             bottom = std::max(bottom, sample.y);
         }
+    if (left > right)
+        return {}; // an empty page
     const float pageWidth = static_cast<float>(width);
     const float pageHeight = static_cast<float>(height);
     const float room = 1.0f - 2.0f * kMargin;

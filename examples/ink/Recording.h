@@ -42,7 +42,7 @@ public:
 };
 
 /// Reads @p path, whose format is recognised by its content. Throws ReadError. The formats:
-/// - W3C InkML (InkMl.h);
+/// - W3C InkML (InkMl.h), the one that may hold no stroke;
 /// - a pen log, one sample a line (PenLog.h);
 /// - tablet samples behind their count (SvcFile.h);
 /// - JSON, of pointer events or of named lists of points (InkJson.h);

@@ -35,6 +35,11 @@ void ExpectReadsBack(const Ink::Recording& recording)
     ExpectEqual(read.hovers, recording.hovers);
 }
 
+TEST(InkMlWriter, AnEmptyPageReadsBack)
+{
+    ExpectReadsBack(Ink::Recording());
+}
+
 TEST(InkMlWriter, WritesATraceAStroke)
 {
     Ink::Recording recording;

@@ -210,6 +210,14 @@ TEST(InkMl, OrientationOfThePenIsKept)
     EXPECT_NEAR(tilted.strokes.at(0).at(0).altitude, 60.0f, 1e-3f);
 }
 
+TEST(InkMl, AnEmptyPageSaysWhatItsTracesWouldBeLike)
+{
+    const Recording page = ReadInkMl(
+        "page.inkml", WithFormat("<channel name=\"X\"/><channel name=\"Y\"/>", "<!-- none -->"));
+    EXPECT_TRUE(page.strokes.empty());
+    EXPECT_TRUE(page.hovers.empty());
+}
+
 TEST(InkMl, ErrorsNameTheLine)
 {
     EXPECT_EQ(InkMlError("<ink>\n<trace>1 2</trace>\n"),

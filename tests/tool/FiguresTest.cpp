@@ -1,8 +1,12 @@
 #include "Figures.h"
 
+#include <fstream>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 #include <numeric>
+#include <regex>
+#include <set>
+#include <string>
 
 namespace
 {
@@ -73,6 +77,43 @@ TEST(Figures, JsonIsOneLineOfShortNumbers)
     EXPECT_EQ(text.find('\n'), std::string::npos);
     EXPECT_NE(text.find("\"p50\":0.1,"), std::string::npos) << text;
     EXPECT_NE(text.find("\"redrawnShare\":0.333333,"), std::string::npos) << text;
+}
+
+/// The keys of an object and of those in it.
+void AddKeys(const Json& object, std::set<std::string>& keys)
+{
+    for (const auto& [key, value] : object.items())
+    {
+        keys.insert(key);
+        if (value.is_object())
+            AddKeys(value, keys);
+    }
+}
+
+/// What stands in `code` in the first two columns of the tables of a page.
+std::set<std::string> DocumentedKeys(const char* page)
+{
+    std::ifstream text(page);
+    EXPECT_TRUE(text) << page;
+    std::set<std::string> keys;
+    const std::regex columns("\\|([^|]*)\\|([^|]*)\\|.*"), key("`([^`]+)`");
+    for (std::string line; std::getline(text, line);)
+    {
+        std::smatch row;
+        if (!std::regex_match(line, row, columns))
+            continue;
+        const std::string names = row[1].str() + row[2].str();
+        for (std::sregex_iterator name(names.begin(), names.end(), key), end; name != end; ++name)
+            keys.insert((*name)[1]);
+    }
+    return keys;
+}
+
+TEST(Figures, EveryKeyIsDocumented)
+{
+    std::set<std::string> keys;
+    AddKeys(Json::parse(ToJson(WithFrames())), keys);
+    EXPECT_EQ(DocumentedKeys(NIB_DRAW_JSON_PAGE), keys);
 }
 
 } // namespace

@@ -1,3 +1,4 @@
+#include "InkMlWriter.h"
 #include "RunNib.h"
 
 #include <fstream>
@@ -42,6 +43,30 @@ TEST_F(RunFigures, LineCountsWhatWasDrawn)
     EXPECT_EQ(result.out.find('\n'), result.out.size() - 1);
     EXPECT_NE(result.out.find("programs 1 compiled 0 loaded"), std::string::npos) << result.out;
     EXPECT_EQ(result.err, "");
+}
+
+TEST_F(RunFigures, AnEmptyPageIsDrawn)
+{
+    const std::string empty = m_folder.Path("empty.inkml");
+    std::ofstream(empty) << Ink::ToInkMl(Ink::Recording()); // as `nib draw --live` saves one
+    for (const Words& frames : {Words{}, Words{"--speed", "max"}, Words{"--scale", "1:1"}})
+    {
+        Words words{"draw", empty, "-o", m_folder.Path("page.png"), "--json"};
+        words.insert(words.end(), frames.begin(), frames.end());
+        const NibResult result = RunNib(words, {{"DISPLAY", ""}});
+        ASSERT_EQ(result.status, 0) << result.err;
+        EXPECT_EQ(Json::parse(result.out).at("strokes"), 0);
+        EXPECT_GT(ContentOf(m_folder.Path("page.png")).size(), 0u);
+    }
+}
+
+TEST_F(RunFigures, AnEmptyPageBetweenOthersChangesNothing)
+{
+    const std::string empty = m_folder.Path("empty.inkml");
+    std::ofstream(empty) << Ink::ToInkMl(Ink::Recording());
+    const NibResult result = Draw({empty, NIB_SAMPLE, "--json"});
+    ASSERT_EQ(result.status, 0) << result.err;
+    EXPECT_EQ(Json::parse(result.out).at("strokes"), 18);
 }
 
 TEST_F(RunFigures, FramesAreShownWithoutAWindowWhenASpeedIsGiven)
