@@ -23,16 +23,17 @@ public:
 
     void Run(Family& family, Random& random) const override
     {
-        std::error_code gone; // another family clears, too
+        Random lots = random.Fork(); // as many as there are files
+        std::error_code gone;        // another family clears, too
         for (const fs::directory_entry& entry :
              fs::directory_iterator(family.Shared().cacheFolder, gone))
         {
             if (entry.path().extension() != ".dat")
                 continue;
-            if (random.OneIn(2))
+            if (lots.OneIn(2))
                 fs::remove(entry.path(), gone);
-            else if (random.OneIn(4))
-                fs::resize_file(entry.path(), static_cast<std::uintmax_t>(random.Below(500)), gone);
+            else if (lots.OneIn(4))
+                fs::resize_file(entry.path(), static_cast<std::uintmax_t>(lots.Below(500)), gone);
         }
     }
 };

@@ -6,6 +6,8 @@
 #include <array>
 #include <atomic>
 #include <cstddef>
+#include <cstdlib>
+#include <cstring>
 
 #include <malloc.h>
 
@@ -15,12 +17,21 @@ extern "C" void __libc_free(void* memory); // NOLINT(bugprone-reserved-identifie
 namespace
 {
 
-constexpr std::size_t kSceneBlock = 64 * 1024 + 16;  ///< what llvmpipe allocates
+constexpr std::size_t kSceneBlock = 64 * 1024 + 16;          ///< what llvmpipe allocates
 constexpr std::size_t kLargestSceneBlock = kSceneBlock + 64; ///< what it may get
 constexpr std::size_t kKept = 256; ///< while one is looked at, the other contexts soon have to wait
 
 std::array<std::atomic<void*>, kKept> s_kept{};
 std::atomic<std::size_t> s_turn{0};
+
+/// From the start, so that the process does not grow by them.
+const bool s_isFilled = []
+{
+    for (std::atomic<void*>& kept : s_kept)
+        kept.store(std::memset(std::malloc(kSceneBlock), 1, kSceneBlock),
+                   std::memory_order_relaxed);
+    return true;
+}();
 
 bool IsSceneBlock(void* memory)
 {

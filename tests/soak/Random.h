@@ -17,7 +17,9 @@ public:
     /// A number below @p limit.
     int Below(int limit)
     {
-        return static_cast<int>(m_engine() % static_cast<std::uint64_t>(limit));
+        const std::uint64_t chosen = m_engine() % static_cast<std::uint64_t>(limit);
+        m_digest = (m_digest ^ chosen) * kDigestFactor;
+        return static_cast<int>(chosen);
     }
 
     /// A number from @p least to @p most.
@@ -25,8 +27,17 @@ public:
 
     bool OneIn(int count) { return Below(count) == 0; }
 
+    /// For choices whose number another thread has a say in: these go on as if one had been made.
+    Random Fork() { return Random(m_engine()); }
+
+    /// Of all choices so far.
+    std::uint64_t Digest() const { return m_digest; }
+
 private:
+    static constexpr std::uint64_t kDigestFactor = 1099511628211; ///< FNV-1a's
+
     std::mt19937_64 m_engine;
+    std::uint64_t m_digest = 14695981039346656037u;
 };
 
 } // namespace Soak

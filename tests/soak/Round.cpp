@@ -55,6 +55,7 @@ void Round::Live(int family)
     {
         Keep("thread " + std::to_string(family) + ", " + doing + ": " + failure.what());
     }
+    m_digest.fetch_add(random.Digest(), std::memory_order_relaxed);
     m_progress.Begin(family, nullptr);
 }
 

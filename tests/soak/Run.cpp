@@ -141,6 +141,7 @@ bool Run::ToTheEnd()
                     m_options.seed + static_cast<std::uint64_t>(m_rounds - 1));
     else if (m_memory.CanBeJudged() && !m_memory.IsFlat())
         lost = "memory grew by more than 1 %";
+    std::printf("soak: choices %016" PRIx64 "\n", m_digest);
     PrintRow(lost);
     return lost.empty();
 }
@@ -155,9 +156,12 @@ bool Run::IsOver() const
 std::string Run::DoRound()
 {
     const std::uint64_t seed = m_options.seed + static_cast<std::uint64_t>(m_rounds++);
-    const std::string failure = Round(m_world, m_progress, seed).Run(m_options.families);
+    Round round(m_world, m_progress, seed);
+    const std::string failure = round.Run(m_options.families);
+    m_digest += round.Digest() * static_cast<std::uint64_t>(m_rounds);
     if (!failure.empty())
         return failure;
+    OnAThread([this] { m_options.leak.LeaveSomething(); });
     const std::string left = CompareHoldings();
     malloc_trim(0); // so that what is resident is what is used
     m_memory.Add(ResidentKiB());

@@ -2,6 +2,7 @@
 #define NIB_TESTS_SOAK_RUN_H
 
 #include "MemoryRecord.h"
+#include "PlantedLeak.h"
 #include "Progress.h"
 #include "World.h"
 
@@ -18,6 +19,7 @@ struct Options
     std::chrono::seconds time{0}; ///< no round is begun behind it
     int rounds = 0;               ///< at most; 0: as many as the time allows
     int families = 4;
+    PlantedLeak leak; ///< what each round is made to leave behind
 };
 
 /// One run: rounds of life, and behind each a look at what the process holds.
@@ -51,6 +53,7 @@ private:
     std::unique_ptr<Held> m_atStart;
     std::string m_driver; ///< as it names itself
     int m_rounds = 0;
+    std::uint64_t m_digest = 0; ///< of the choices of all rounds
 };
 
 } // namespace Soak

@@ -18,12 +18,19 @@ constexpr int kSkippedStatus = 77;
 const char* const kUsage =
     "usage: nib_soak [--seed N] [--minutes N | --seconds N] [--rounds N] [--threads N]\n";
 
-/// False when @p arguments are none of the program's.
+/// False when @p arguments are none of the program's. --plant-leak is for the tests of this program:
+/// what it leaves behind has to be found.
 bool Parse(int count, char** arguments, Soak::Options& options)
 {
     for (int i = 1; i + 1 < count; i += 2)
     {
         const std::string name = arguments[i];
+        if (name == "--plant-leak")
+        {
+            if (!options.leak.Choose(arguments[i + 1]))
+                return false;
+            continue;
+        }
         char* end = nullptr;
         const unsigned long long number = std::strtoull(arguments[i + 1], &end, 10);
         if (*end != '\0' || end == arguments[i + 1])
