@@ -29,6 +29,7 @@ std::unique_ptr<Action> MakeSharedThreadAction(); ///< the thread that the proce
 std::unique_ptr<Action> MakeStrokeAction();       ///< a stroke is drawn and shown
 std::unique_ptr<Action> MakePageAction();         ///< a page is drawn, exported, compared
 std::unique_ptr<Action> MakeLossAction();         ///< the same, and its context is lost meanwhile
+std::unique_ptr<Action> MakeGuestAction();        ///< a page is drawn inside another's frames
 std::unique_ptr<Action> MakeProgramAction();      ///< programs are built on all threads at once
 std::unique_ptr<Action> MakeResourceAction();     ///< textures, meshes, targets, fences
 std::unique_ptr<Action> MakeCacheAction();        ///< the program cache's files are cleared
@@ -38,9 +39,10 @@ std::unique_ptr<Action> MakeWorkerAction();       ///< a pool of workers
 inline std::vector<std::unique_ptr<Action>> AllActions()
 {
     std::vector<std::unique_ptr<Action>> all;
-    for (const auto make : {&MakeWindowAction, &MakeThreadAction, &MakeSharedThreadAction,
-                            &MakeStrokeAction, &MakePageAction, &MakeLossAction, &MakeProgramAction,
-                            &MakeResourceAction, &MakeCacheAction, &MakeWorkerAction})
+    for (const auto make :
+         {&MakeWindowAction, &MakeThreadAction, &MakeSharedThreadAction, &MakeStrokeAction,
+          &MakePageAction, &MakeLossAction, &MakeGuestAction, &MakeProgramAction,
+          &MakeResourceAction, &MakeCacheAction, &MakeWorkerAction})
         all.push_back(make());
     return all;
 }

@@ -5,6 +5,7 @@
 
 #include <atomic>
 #include <filesystem>
+#include <mutex>
 
 namespace Soak
 {
@@ -15,6 +16,7 @@ struct World
     Pages pages;
     std::filesystem::path cacheFolder; ///< of the program cache
     std::atomic<int> actions{0};       ///< done so far
+    std::mutex host;                   ///< held by the family that has the process's UI
 };
 
 } // namespace Soak
