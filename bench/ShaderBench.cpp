@@ -151,7 +151,9 @@ BENCHMARK(BM_GlProgramBinary);
 void GlProgramBinaryFromDisk(benchmark::State& state, bool keepsBytes)
 {
     const std::vector<std::string> files = NewFiles(NewVertexSources());
-    std::vector<std::unique_ptr<unsigned char[]>> kept(files.size());
+    static std::vector<std::unique_ptr<unsigned char[]>>
+        kept; // to the end, as the library keeps it
+    kept.reserve(kept.size() + files.size());
     std::size_t number = 0;
     for (auto _ : state)
     {
@@ -163,7 +165,7 @@ void GlProgramBinaryFromDisk(benchmark::State& state, bool keepsBytes)
             state.SkipWithError("the driver refuses its binary");
         glDeleteProgram(program);
         if (keepsBytes)
-            kept[number] = std::move(file);
+            kept.push_back(std::move(file));
         ++number;
     }
 }
