@@ -28,7 +28,7 @@ namespace fs = std::filesystem;
 namespace
 {
 
-constexpr int kPrograms = 500; // sources, files and records of one benchmark
+constexpr int kPrograms = 100; // sources, files and records of one benchmark
 
 const std::string kVertex = "attribute vec2 a_position;\n"
                             "attribute vec4 a_color;\n"

@@ -87,12 +87,23 @@ bool BinaryShaderReader::ReadAttributes()
 {
     if (m_header.attributeSize == 0)
         return true; // the number of names is then not looked at
-    std::vector<unsigned char> block(static_cast<std::size_t>(m_header.attributeSize));
-    if (!Take(block.data(), block.size()))
-        return Fail(ShaderFileFault::Attributes);
-    m_crc = ContinueCrc(m_crc, block.data(), block.size());
+    const auto size = static_cast<std::size_t>(m_header.attributeSize);
+    std::vector<unsigned char> rest; // of what did not come with the beginning of the file
+    const unsigned char* block = m_first + m_taken;
+    if (size <= m_firstSize - m_taken)
+    {
+        m_taken += size;
+    }
+    else
+    {
+        rest.resize(size);
+        block = rest.data();
+        if (!Take(rest.data(), size))
+            return Fail(ShaderFileFault::Attributes);
+    }
+    m_crc = ContinueCrc(m_crc, block, size);
     const bool isParsed = ShaderProgramCache::ParseShaderAttributes(
-        block.data(), static_cast<unsigned int>(block.size()), m_shader->attributes);
+        block, static_cast<unsigned int>(size), m_shader->attributes);
     if (isParsed && m_shader->attributes.size() == m_header.attributeCount)
         return true;
     return Fail(ShaderFileFault::Names);

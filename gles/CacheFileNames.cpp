@@ -6,6 +6,8 @@
 #include <cerrno>
 #include <charconv>
 #include <csignal>
+#include <iterator>
+#include <limits>
 #include <memory>
 #include <optional>
 #include <string_view>
@@ -82,7 +84,13 @@ struct CloseFolder
 
 std::string ShaderFileName(std::uint64_t key)
 {
-    return std::string(kShaderPrefix) + std::to_string(key) + std::string(kShaderSuffix);
+    char digits[std::numeric_limits<std::uint64_t>::digits10 + 1];
+    const char* const end = std::to_chars(digits, std::end(digits), key).ptr;
+    std::string name;
+    name.reserve(kShaderPrefix.size() + sizeof digits + kShaderSuffix.size());
+    return name.append(kShaderPrefix)
+        .append(digits, static_cast<std::size_t>(end - digits))
+        .append(kShaderSuffix);
 }
 
 std::optional<std::uint64_t> KeyInFileName(std::string_view name)

@@ -181,12 +181,12 @@ ShaderProgramCache::HoldBinaryShader(BinaryShaderKey key)
 std::shared_ptr<const ShaderProgramCache::BinaryShader>
 ShaderProgramCache::FindOrLoad(BinaryShaderKey key)
 {
-    const auto known = m_binaries.find(key);
-    if (known != m_binaries.end())
-        return known->second;
+    const auto place = m_binaries.lower_bound(key);
+    if (place != m_binaries.end() && place->first == key)
+        return place->second;
     std::shared_ptr<const BinaryShader> loaded(LoadFromFile(key));
     if (loaded)
-        m_binaries.emplace(key, loaded);
+        m_binaries.emplace_hint(place, key, loaded);
     return loaded;
 }
 
