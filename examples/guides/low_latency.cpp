@@ -57,7 +57,7 @@ int main()
         ShowPiece(thread, Nib::RectF(x, 0, x + 10.0f, 10),
                   [&pieces]
                   {
-                      glClear(GL_COLOR_BUFFER_BIT); // in place of the ink
+                      glClear(GL_COLOR_BUFFER_BIT); // stands for the ink
                       ++pieces;
                   });
     std::printf("%d pieces, %s\n", pieces,

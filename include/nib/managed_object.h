@@ -96,8 +96,8 @@ private:
     std::unordered_map<IManagedObject* const*, const char*> m_typeNames;
 };
 
-/// The base of every GL object of the library: subscribes the object to the message queue of the GL
-/// thread on which it is made, and turns release and restore into one call each.
+/// The base of every GL object of the library: Register(), in a constructor, subscribes the object to
+/// the message queue of the GL thread; each release and each restore then is one call.
 ///
 /// Threads  the GL thread of the object's context, destruction included. An object destroyed on
 ///          another thread leaves its entry in the list of its queue, and the next dispatch of that
