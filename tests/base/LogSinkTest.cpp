@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
+#include <cerrno>
 #include <string>
 #include <thread>
 #include <utility>
@@ -58,6 +59,18 @@ TEST_F(LogSink, TakesInfoAndAboveUnlessToldOtherwise)
     m_print(ANDROID_LOG_DEBUG, "nib_log", "debug again");
     m_print(ANDROID_LOG_VERBOSE, "nib_log", "verbose");
     EXPECT_EQ(m_lines, (Lines{{4, "info"}, {3, "debug again"}}));
+}
+
+TEST_F(LogSink, TakesLinesThoughThoseBeforeItWereLeftOut)
+{
+    m_print(ANDROID_LOG_ERROR, "nib_log", "before");
+    Nib::SetLogSink(&Collect, &m_lines);
+    m_print(ANDROID_LOG_ERROR, "nib_log", "after");
+    Nib::SetLogSink(nullptr, nullptr);
+    EXPECT_EQ(m_print(ANDROID_LOG_ERROR, "nib_log", "dropped"), -EPERM);
+    Nib::SetLogSink(&Collect, &m_lines);
+    m_print(ANDROID_LOG_ERROR, "nib_log", "again");
+    EXPECT_EQ(m_lines, (Lines{{6, "after"}, {6, "again"}}));
 }
 
 TEST_F(LogSink, IsCalledNoMoreOnceEnded)
