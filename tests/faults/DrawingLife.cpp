@@ -7,6 +7,8 @@ using namespace Nib;
 namespace
 {
 
+constexpr int kFrontSide = 30; // of the window with the front buffer
+
 class CallTask : public ITask
 {
 public:
@@ -37,6 +39,9 @@ void DrawingLife::Live()
     ShowWindow(60, 40);
     DrawFrame(0.75f, RectF{0, 0, 60, 40});
     DrawFrame(0.875f, RectF{5, 5, 55, 20});
+    StartFront();
+    DrawInFront(0.1875f);
+    DrawInFront(0.3125f);
     End();
 }
 
@@ -89,8 +94,34 @@ void DrawingLife::ExportOnChild(float shade)
              });
 }
 
+void DrawingLife::StartFront()
+{
+    m_front.reset(RendererFactory::CreateFBRSurfaceRenderer(m_surface->GetMsgQueue(), "front"));
+    if (!m_front->Start())
+        Note("front not started");
+    m_front->OnSurfaceChanged(m_driver.Window(kFrontSide, kFrontSide), kFrontSide, kFrontSide, 1);
+    OnThread(*m_front, [this] { m_inFront.Make(); });
+}
+
+void DrawingLife::DrawInFront(float shade)
+{
+    OnThread(*m_front,
+             [this, shade]
+             {
+                 const Made<IRenderTarget> screen(
+                     RendererFactory::CreateRenderTargetFromDefault(kFrontSide, kFrontSide));
+                 m_inFront.DrawOffscreen(shade);
+                 m_inFront.DrawOn(*screen, shade);
+             });
+    if (!m_front->Render())
+        Note("front not rendered");
+}
+
 void DrawingLife::End()
 {
+    EndOnThread(*m_front, m_inFront);
+    m_front->OnSurfaceDestroyed();
+    m_front.reset();
     EndOnThread(*m_child, m_offScreen);
     m_child.reset();
     EndOnThread(*m_surface, m_onScreen);

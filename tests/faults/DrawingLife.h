@@ -61,7 +61,7 @@ private:
 };
 
 /// A life with windows: start, window, frames with partial update, an offscreen child that is
-/// paused, resumed and exports, another window, the end. Every step waits for its threads, so that
+/// paused, resumed and exports, another window, a second window that is drawn in its front buffer, the end. Every step waits for its threads, so that
 /// the calls come in the same order each time.
 ///
 /// The application in it is careful: it draws only where there is a context, and catches what the
@@ -85,14 +85,18 @@ private:
     void StartChild();
     void PauseAndResumeChild();
     void ExportOnChild(float shade);
+    void StartFront();
+    void DrawInFront(float shade);
     void End();
     void Note(const std::string& text) { m_notes.push_back(text); }
 
     SimDriver& m_driver;
     std::unique_ptr<Nib::RenderThreadGL> m_surface;
     std::unique_ptr<Nib::RenderThreadGL> m_child;
+    std::unique_ptr<Nib::RenderThreadGL> m_front;
     DrawnThings m_onScreen;
     DrawnThings m_offScreen;
+    DrawnThings m_inFront;
     int m_width = 0;
     int m_height = 0;
     std::vector<std::string> m_notes;

@@ -48,7 +48,7 @@ void Sweep(Fault::Kind kind, const SimGpu& gpu, const std::string& what)
     const LifeRecord whole = LiveOnce(gpu, {});
     ASSERT_EQ(whole.run.end, "") << whole.run.messages << whole.run.stuck;
     ASSERT_GT(whole.calls.size(), 500u);
-    ASSERT_EQ(whole.pictures.size(), 6u); // four frames, two exports
+    ASSERT_EQ(whole.pictures.size(), 9u); // four frames, two exports, two frames in a front buffer
     ASSERT_EQ(whole.notes, std::vector<std::string>{});
     Account account;
     for (std::size_t n = 1; n <= whole.calls.size(); n += Stride())

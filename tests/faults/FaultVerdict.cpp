@@ -28,6 +28,8 @@ const Names& ToldByGlAlone()
         "glClear", "glClearColor", "glClearDepthf", "glClearStencil", "glDrawArraysInstanced",
         "glDrawElements", "glReadPixels", "glTexSubImage2D", "glPixelStorei",
         "glFramebufferRenderbuffer",
+        // the end of a frame in the front buffer
+        "glFinish",
         // the end of a frame: the result of the call is DoSwapBuffers's, the reason EGL's to tell
         "eglPostSubBufferNV", "eglSwapBuffersWithDamageKHR"};
     return *names;
@@ -71,7 +73,7 @@ const Names& CalledWithoutContext()
 {
     static const auto* names = new Names{
         // the end of a frame and the change of a window, whether or not a context is current
-        "glFinish", "glGetIntegerv", "glInvalidateFramebuffer", "glGetString",
+        "glDisable", "glFinish", "glGetIntegerv", "glInvalidateFramebuffer", "glGetString",
         // the end of objects, which goes on without asking
         "glDeleteBuffers", "glDeleteFramebuffers", "glDeleteProgram", "glDeleteRenderbuffers",
         "glDeleteSamplers", "glDeleteSync", "glDeleteTextures", "glDeleteShader",
