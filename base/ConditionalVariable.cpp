@@ -1,14 +1,10 @@
+#include "base/HandOver.h"
 #include "base/ThreadAnnotations.h"
+#include "base/WaitWord.h"
 
 #include <nib/base.h>
 
-#include <cerrno>
-#include <climits>
 #include <ctime>
-
-#include <linux/futex.h>
-#include <sys/syscall.h>
-#include <unistd.h>
 
 // Every waiter stands in the list with a word of its own, on its own stack, and sleeps until that
 // word says that it was signalled. So a signal reaches exactly the thread that it was given to, and
@@ -20,9 +16,6 @@ namespace Nib
 
 namespace
 {
-
-constexpr int kWaiting = 0;
-constexpr int kSignalled = 1;
 
 timespec DeadlineAfter(int milliseconds)
 {
@@ -39,30 +32,21 @@ timespec DeadlineAfter(int milliseconds)
     return deadline;
 }
 
-// The deadline is a point of the monotonic clock; null for none. False only when it has passed.
-bool SleepWhileWaiting(std::atomic<int>* word, const timespec* deadline)
+// For the look without the guard.
+template <typename T>
+void Publish(T*& place, T* value)
 {
-    const long result = syscall(SYS_futex, word, FUTEX_WAIT_BITSET | FUTEX_PRIVATE_FLAG, kWaiting,
-                                deadline, nullptr, FUTEX_BITSET_MATCH_ANY);
-    return result == 0 || errno != ETIMEDOUT;
+    __atomic_store_n(&place, value, __ATOMIC_SEQ_CST);
 }
-
-void Wake(std::atomic<int>* word)
-{
-    // The address only: the waiter may have seen its word and gone on, and then this wakes nobody.
-    syscall(SYS_futex, word, FUTEX_WAKE | FUTEX_PRIVATE_FLAG, 1, nullptr, nullptr, 0);
-}
-
-static_assert(sizeof(std::atomic<int>) == sizeof(int) && std::atomic<int>::is_always_lock_free,
-              "the system sleeps on the bare integer");
 
 } // namespace
 
 struct ConditionalVariable::Waiter
 {
-    std::atomic<int> state{kWaiting};
+    WaitWord word;
     Waiter* next = nullptr;
     Waiter* previous = nullptr;
+    bool isListed = true; // under the guard; no longer once a signal is given to it
 };
 
 bool ConditionalVariable::Wait(CriticalSection* section,
@@ -76,14 +60,17 @@ bool ConditionalVariable::Wait(CriticalSection* section,
 
     Append(&waiter);
     section->Leave();
-    bool signalled = true;
-    // Acquire, paired with the release in Signal and SignalAll.
-    while (waiter.state.load(std::memory_order_acquire) == kWaiting)
+    if (HandOver* const handOver = HandOver::OfThisThread())
     {
-        if (SleepWhileWaiting(&waiter.state, hasDeadline ? &deadline : nullptr))
-            continue;
+        handOver->AfterSectionIsLeft();
+        handOver->Spin(waiter.word);
+    }
+    bool signalled = true;
+    if (!waiter.word.Sleep(hasDeadline ? &deadline : nullptr))
+    {
         signalled = !GiveUp(&waiter);
-        break;
+        if (signalled)
+            waiter.word.Sleep(); // until whoever signals has ended it
     }
     section->Enter();
     return signalled;
@@ -91,16 +78,21 @@ bool ConditionalVariable::Wait(CriticalSection* section,
 
 void ConditionalVariable::Signal() noexcept
 {
+    // The section orders this against the waiters; a wait that begins meanwhile without one may or
+    // may not be meant.
+    if (__atomic_load_n(&m_first, __ATOMIC_SEQ_CST) == nullptr)
+        return;
     pthread_mutex_lock(&m_guard);
     Waiter* waiter = m_first;
     if (waiter)
-    {
         Unlink(waiter);
-        waiter->state.store(kSignalled, std::memory_order_release);
-    }
     pthread_mutex_unlock(&m_guard);
-    if (waiter)
-        Wake(&waiter->state);
+    if (!waiter)
+        return;
+    if (HandOver* const handOver = HandOver::OfThisThread())
+        handOver->EndLater(&waiter->word);
+    else if (waiter->word.End())
+        waiter->word.WakeSleeper();
 }
 
 void ConditionalVariable::SignalAll() noexcept
@@ -110,8 +102,8 @@ void ConditionalVariable::SignalAll() noexcept
     {
         Waiter* waiter = m_first;
         Unlink(waiter);
-        waiter->state.store(kSignalled, std::memory_order_release);
-        Wake(&waiter->state);
+        if (waiter->word.End())
+            waiter->word.WakeSleeper();
     }
     pthread_mutex_unlock(&m_guard);
 }
@@ -120,7 +112,10 @@ void ConditionalVariable::Append(Waiter* waiter) noexcept
 {
     pthread_mutex_lock(&m_guard);
     waiter->previous = m_last;
-    (m_last ? m_last->next : m_first) = waiter;
+    if (m_last)
+        m_last->next = waiter;
+    else
+        Publish(m_first, waiter);
     m_last = waiter;
     pthread_mutex_unlock(&m_guard);
 }
@@ -129,7 +124,7 @@ void ConditionalVariable::Append(Waiter* waiter) noexcept
 bool ConditionalVariable::GiveUp(Waiter* waiter) noexcept
 {
     pthread_mutex_lock(&m_guard);
-    const bool waiting = waiter->state.load(std::memory_order_relaxed) == kWaiting;
+    const bool waiting = waiter->isListed;
     if (waiting)
         Unlink(waiter);
     pthread_mutex_unlock(&m_guard);
@@ -139,7 +134,11 @@ bool ConditionalVariable::GiveUp(Waiter* waiter) noexcept
 // The caller holds the guard.
 void ConditionalVariable::Unlink(Waiter* waiter) noexcept
 {
-    (waiter->previous ? waiter->previous->next : m_first) = waiter->next;
+    waiter->isListed = false;
+    if (waiter->previous)
+        waiter->previous->next = waiter->next;
+    else
+        Publish(m_first, waiter->next);
     (waiter->next ? waiter->next->previous : m_last) = waiter->previous;
 }
 

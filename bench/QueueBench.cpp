@@ -292,6 +292,42 @@ void BM_SyncCallBareFutex(benchmark::State& state)
     Unpin();
 }
 
+/// Two words that two processors hand to each other: below this no call can come. It differs from
+/// run to run where the system under this one moves its processors.
+void BM_SyncCallBareSpin(benchmark::State& state)
+{
+    PinTo(0);
+    alignas(128) std::atomic<int> to{0};
+    alignas(128) std::atomic<int> back{0};
+    std::thread worker(
+        [&]
+        {
+            PinTo(1);
+            back.store(-1, std::memory_order_release);
+            for (int turn = 1; turn <= 20000; ++turn)
+            {
+                while (to.load(std::memory_order_acquire) != turn)
+                    continue;
+                back.store(turn, std::memory_order_release);
+            }
+        });
+    while (back.load(std::memory_order_acquire) != -1)
+        sched_yield();
+    Samples samples(state);
+    int turn = 0;
+    for (auto _ : state)
+    {
+        const Clock::time_point begin = Clock::now();
+        to.store(++turn, std::memory_order_release);
+        while (back.load(std::memory_order_acquire) != turn)
+            continue;
+        samples.Add(Clock::now() - begin);
+    }
+    worker.join();
+    Unpin();
+}
+
+BENCHMARK(BM_SyncCallBareSpin)->Iterations(20000)->UseRealTime();
 BENCHMARK(BM_SyncCallBareFutex)->Arg(1)->Arg(0)->Iterations(20000)->UseRealTime();
 BENCHMARK_TEMPLATE(BM_SyncCall, NibExecutor)->Arg(1)->Arg(0)->Iterations(20000)->UseRealTime();
 BENCHMARK_TEMPLATE(BM_SyncCall, LockedDequeExecutor)

@@ -4,9 +4,13 @@
 #include <nib/task.h>
 
 #include <atomic>
+#include <cstddef>
 
 namespace Nib
 {
+
+/// Bytes that processors hand to each other as one: what different threads write lies apart.
+constexpr std::size_t kCacheLine = 64;
 
 /// A queue of tasks that chains the tasks' own links behind a stub: any thread appends, without a
 /// lock and without allocating; one thread takes.
@@ -30,9 +34,11 @@ private:
 
     void Append(Link* item) noexcept;
 
+    Link* m_head = &m_stub; // the consumer's end
+    // The producers' end. The stub is beside it: it is linked when the queue runs empty, and then
+    // both ends touch both.
+    alignas(kCacheLine) std::atomic<Link*> m_tail{&m_stub};
     Link m_stub;
-    Link* m_head = &m_stub;             // the consumer's end
-    std::atomic<Link*> m_tail{&m_stub}; // the producers' end
 };
 
 inline void TaskQueue::Append(Link* item) noexcept

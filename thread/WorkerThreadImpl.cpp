@@ -1,12 +1,16 @@
 #include "thread/WorkerThreadImpl.h"
 
+#include "base/HandOver.h"
 #include "base/Log.h"
+#include "base/Spin.h"
 #include "thread/GlobalLocker.h"
 #include "thread/TaskScope.h"
 
 #include <algorithm>
 #include <memory>
 #include <new>
+#include <optional>
+#include <utility>
 
 namespace Nib
 {
@@ -78,8 +82,8 @@ IWorkerThread* IWorkerThread::CreateInstance_GlobalLock(const char* name,
 
 WorkerThreadImpl::WorkerThreadImpl(const char* name, Thread::ThreadPriority priority,
                                    bool globalLock)
-    : m_outerLock(kReentrant), m_syncLock(!kReentrant), m_wakeLock(!kReentrant),
-      m_globalLock(globalLock), m_priority(priority), m_name(name)
+    : m_globalLock(globalLock), m_priority(priority), m_name(name), m_outerLock(kReentrant),
+      m_syncLock(!kReentrant), m_wakeLock(!kReentrant)
 {
     NIB_FUNCTION("Nib::WorkerThreadImpl::WorkerThreadImpl(const char *, "
                  "Thread::ThreadPriority, bool)");
@@ -152,6 +156,7 @@ bool WorkerThreadImpl::Resume()
 
 void WorkerThreadImpl::Wakeup()
 {
+    const HandOver wakesWithoutLock;
     AutoCriticalSection lock(m_wakeLock);
     m_wakeCondition.Signal();
 }
@@ -215,7 +220,19 @@ void WorkerThreadImpl::RunSyncTask(ITask* task, bool aheadOfQueue, bool deleteAf
     const WatchedCall wait(WatchedCall::Kind::Wait, m_watched, task);
     const TaskScope trace(m_name, *task);
     AutoCriticalSection outer(m_outerLock);
+    HandOver handOver; // so that the worker comes when m_syncLock is free
+    handOver.TellWhenLeft(&m_isSyncLockLeft);
+    if (!IsPaused() && m_partners.CallerMaySpin(m_threadNumber))
+        handOver.SpinInWait();
+    HandOverAndWait(task, aheadOfQueue, deleteAfterRun);
+    if (handOver.HasSpunInVain())
+        m_partners.CallerSpunInVain();
+}
+
+void WorkerThreadImpl::HandOverAndWait(ITask* task, bool aheadOfQueue, bool deleteAfterRun)
+{
     AutoCriticalSection sync(m_syncLock);
+    m_isSyncLockLeft.store(false, std::memory_order_relaxed);
     if (aheadOfQueue)
     {
         m_deleteDirectTask = deleteAfterRun;
@@ -265,6 +282,8 @@ void WorkerThreadImpl::RunTurn()
 
 void WorkerThreadImpl::SleepUntilNeeded()
 {
+    if (ExpectsCall() && SpinForWork())
+        return;
     AutoCriticalSection lock(m_wakeLock);
     const bool isIdle =
         IsPaused() ? !HasDirectTask() : m_pending.load(std::memory_order_seq_cst) < 1;
@@ -272,6 +291,23 @@ void WorkerThreadImpl::SleepUntilNeeded()
     // missed.
     if (isIdle)
         m_wakeCondition.Wait(&m_wakeLock, kNoTimeout);
+}
+
+// Behind a synchronous call: who waited for it comes again soon. Who only posts does not wait, and
+// to spin for the next task would take the processor from others.
+bool WorkerThreadImpl::ExpectsCall()
+{
+    return std::exchange(m_hasAnswered, false) && !IsPaused() && m_partners.WorkerMaySpin();
+}
+
+bool WorkerThreadImpl::SpinForWork()
+{
+    const auto isIdle = [this]
+    { return !IsPaused() && m_pending.load(std::memory_order_acquire) < 1; };
+    const bool found = Spin::While(isIdle);
+    if (!found)
+        m_partners.WorkerSpunInVain();
+    return found;
 }
 
 void WorkerThreadImpl::RunDirectTask()
@@ -296,6 +332,8 @@ void WorkerThreadImpl::RunOneAsyncTask()
 
 bool WorkerThreadImpl::RunSynchronously(std::atomic<ITask*>& task, bool deleteAfterRun)
 {
+    AwaitSyncLock();
+    std::optional<HandOver> answersWithoutLock; // from the signal on: the task signals at once
     AutoCriticalSection lock(m_syncLock);
     ITask* const run = task.load(std::memory_order_acquire);
     RunGuarded(run);
@@ -303,8 +341,17 @@ bool WorkerThreadImpl::RunSynchronously(std::atomic<ITask*>& task, bool deleteAf
     if (deleteAfterRun)
         delete run;
     task.store(nullptr, std::memory_order_release);
+    m_hasAnswered = true;
+    answersWithoutLock.emplace();
     m_doneCondition.Signal();
     return true;
+}
+
+// The caller is about to leave the lock; to sleep for that would take both a system call.
+void WorkerThreadImpl::AwaitSyncLock() const
+{
+    if (m_partners.WorkerMaySpin())
+        Spin::While([this] { return !m_isSyncLockLeft.load(std::memory_order_relaxed); });
 }
 
 void WorkerThreadImpl::RunGuarded(ITask* task)

@@ -2,6 +2,7 @@
 #define NIB_THREAD_WORKER_THREAD_IMPL_H
 
 #include "base/ThreadAnnotations.h"
+#include "thread/SpinPartners.h"
 #include "thread/TaskQueue.h"
 #include "thread/WatchedCall.h"
 
@@ -47,11 +48,15 @@ private:
 
     static void ThreadProcedure(void* worker);
     void RunUntilQuit();
+    void HandOverAndWait(ITask* task, bool aheadOfQueue, bool deleteAfterRun);
     void RunTurn();
     void SleepUntilNeeded();
+    bool ExpectsCall();
+    bool SpinForWork();
     void RunDirectTask();
     void RunOneAsyncTask();
     bool RunSynchronously(std::atomic<ITask*>& task, bool deleteAfterRun);
+    void AwaitSyncLock() const;
     void RunGuarded(ITask* task);
     void TraceQueue(std::int32_t pending) const;
 
@@ -60,27 +65,36 @@ private:
     bool IsPaused() const { return m_paused.load(std::memory_order_seq_cst); }
     bool HasDirectTask() const { return m_directTask.load(std::memory_order_acquire) != nullptr; }
 
-    // Order: m_outerLock, m_syncLock, m_wakeLock. The worker takes the last two, never together.
-    CriticalSection m_outerLock; // one synchronous caller at a time; re-entrant for Terminate
-    CriticalSection m_syncLock NIB_ACQUIRED_AFTER(m_outerLock);
-    CriticalSection m_wakeLock NIB_ACQUIRED_AFTER(m_syncLock);
-    ConditionalVariable m_wakeCondition;    // with m_wakeLock; the worker sleeps on it
-    ConditionalVariable m_doneCondition;    // with m_syncLock; the synchronous caller sleeps on it
-    std::atomic<Thread*> m_thread{nullptr}; // owned; written under m_outerLock
-    TaskQueue m_queue;
+    // What everybody reads and hardly anybody writes.
     std::atomic<bool> m_paused{true}; // the worker reads it again at every turn
     std::atomic<bool> m_quit{false};
     const bool m_globalLock;
-    // Tasks in the queue, and one for a direct task. -1 for a moment when the worker takes a task
-    // that its producer has linked but not yet counted.
-    std::atomic<std::int32_t> m_pending{0};
-    std::int32_t m_leftBehind = 0;             // tasks that stayed queued at the last termination
-    std::atomic<ITask*> m_directTask{nullptr}; // filled under m_syncLock, looked at without it
-    bool m_deleteDirectTask = false;           // published by m_directTask
+    std::atomic<Thread*> m_thread{nullptr}; // owned; written under m_outerLock
     const Thread::ThreadPriority m_priority;
     const char* const m_name;                     // the caller's
     std::atomic<std::uint64_t> m_threadNumber{0}; // the system's, 0 without a thread
     const WatchTarget m_watched{m_name, &m_threadNumber, &m_paused};
+    SpinPartners m_partners;
+    std::int32_t m_leftBehind = 0;             // tasks that stayed queued at the last termination
+    std::atomic<ITask*> m_directTask{nullptr}; // filled under m_syncLock, looked at without it
+    bool m_deleteDirectTask = false;           // published by m_directTask
+
+    // Order: m_outerLock, m_syncLock, m_wakeLock. The worker takes the last two, never together.
+    // What the caller and the worker write in turn lies apart from what only the caller writes.
+    alignas(kCacheLine) CriticalSection m_outerLock; // one synchronous caller at a time;
+                                                     // re-entrant for Terminate
+    alignas(kCacheLine) CriticalSection m_syncLock NIB_ACQUIRED_AFTER(m_outerLock);
+    std::atomic<bool> m_isSyncLockLeft{true}; // by the latest caller, which waits
+    alignas(kCacheLine) CriticalSection m_wakeLock NIB_ACQUIRED_AFTER(m_syncLock);
+    ConditionalVariable m_wakeCondition; // with m_wakeLock; the worker sleeps on it
+    alignas(kCacheLine) ConditionalVariable m_doneCondition; // with m_syncLock; the synchronous
+                                                             // caller sleeps on it
+
+    // Tasks in the queue, and one for a direct task. -1 for a moment when the worker takes a task
+    // that its producer has linked but not yet counted.
+    alignas(kCacheLine) std::atomic<std::int32_t> m_pending{0};
+    alignas(kCacheLine) TaskQueue m_queue;
+    bool m_hasAnswered = false; // a synchronous call, since the worker was last idle
 };
 
 } // namespace Nib

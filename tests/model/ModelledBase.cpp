@@ -3,9 +3,13 @@
 
 #include "ModelAtomic.h"
 
+#include "base/Futex.h"
+#include "thread/SpinPartners.h"
+#include "thread/TaskScope.h"
 #include "thread/WatchedCall.h"
 
 #include <nib/base.h>
+#include <nib/trace.h>
 
 #include <android/log.h>
 
@@ -87,6 +91,49 @@ void ConditionalVariable::Signal() noexcept
     waiter->signalled = true;
 }
 
+// ---- sleeping on a word -------------------------------------------------------------------------
+
+namespace
+{
+
+/// Those that sleep, each with the word that it sleeps on.
+std::list<std::atomic<int>*>& Sleepers()
+{
+    static std::list<std::atomic<int>*> sleepers;
+    static long execution = 0;
+    if (std::exchange(execution, Model::Execution()) != Model::Execution())
+        sleepers.clear();
+    return sleepers;
+}
+
+} // namespace
+
+// As the system does it: a sleeper can be woken from before it compares the newest value. It orders
+// nothing else.
+bool FutexWait(std::atomic<int>& word, int value, const timespec*)
+{
+    std::list<std::atomic<int>*>& sleepers = Sleepers();
+    Model::Before({&sleepers, true});
+    const auto self = sleepers.insert(sleepers.end(), &word);
+    const bool sleeps = word.fetch_add(0, std::memory_order_relaxed) == value;
+    Model::Before({&sleepers, true}, [=] { return !sleeps || *self == nullptr; });
+    sleepers.erase(self);
+    return true;
+}
+
+void FutexWake(std::atomic<int>& word)
+{
+    Model::Before({&Sleepers(), true});
+    for (std::atomic<int>*& sleeper : Sleepers())
+    {
+        if (sleeper == &word)
+        {
+            sleeper = nullptr;
+            return;
+        }
+    }
+}
+
 // ---- threads ------------------------------------------------------------------------------------
 
 Thread::Thread(Procedure procedure, void* argument, const char* name,
@@ -114,6 +161,11 @@ void Thread::join() noexcept
         Model::Join(static_cast<int>(m_thread));
 }
 
+Thread::Handle Thread::self() noexcept
+{
+    return Model::Self() + 1;
+}
+
 std::uint64_t GetNibCurrentThreadId() noexcept
 {
     return static_cast<std::uint64_t>(Model::Self()) + 1;
@@ -137,6 +189,35 @@ void ITask::operator delete(void* memory, std::size_t) noexcept
 {
     ::operator delete(memory);
 }
+
+// ---- spinning, which nobody does ----------------------------------------------------------------
+
+bool SpinPartners::WorkerMaySpin() const
+{
+    return false;
+}
+bool SpinPartners::CallerMaySpin(const std::atomic<std::uint64_t>&)
+{
+    return false;
+}
+void SpinPartners::WorkerSpunInVain() {}
+void SpinPartners::CallerSpunInVain() {}
+
+// ---- the trace, which is off --------------------------------------------------------------------
+
+std::atomic<unsigned> Trace::s_listeners{0};
+void Trace::Write(TraceEvent::Kind, const char*, const char*, std::initializer_list<TraceArgument>)
+{
+}
+void Trace::WriteCounter(const char*, const char*, std::int64_t, std::uint64_t, const char*) {}
+const char* Trace::ExchangeLane(const char*)
+{
+    return nullptr;
+}
+void Trace::StartFromEnvironment() {}
+void TaskScope::BeginRun(const ITask&, const std::type_info*) {}
+void TaskScope::BeginWait(const char*, const ITask&) {}
+void TaskScope::End() {}
 
 // ---- the watchdog, which is off -----------------------------------------------------------------
 

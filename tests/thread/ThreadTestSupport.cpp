@@ -1,5 +1,7 @@
 #include "thread/ThreadTestSupport.h"
 
+#include "base/HandOver.h"
+
 #include <cstdlib>
 #include <new>
 
@@ -12,6 +14,7 @@ namespace
 
 std::atomic<int> g_signals{0};
 std::atomic<int> g_waits{0};
+std::atomic<int> g_spins{0};
 
 constexpr const char* kSignalSymbol = "_ZN3Nib19ConditionalVariable6SignalEv";
 constexpr const char* kWaitSymbol = "_ZN3Nib19ConditionalVariable4WaitEPNS_15CriticalSectionEi";
@@ -54,6 +57,20 @@ void WaitForWaits(int before, int more)
 {
     while (WaitsSoFar() < before + more)
         std::this_thread::yield();
+}
+
+void Nib::HandOver::SpinInWait() noexcept
+{
+    using Real = void (*)(HandOver*);
+    static const Real real =
+        reinterpret_cast<Real>(dlsym(RTLD_NEXT, "_ZN3Nib8HandOver10SpinInWaitEv"));
+    g_spins.fetch_add(1);
+    real(this);
+}
+
+int SpinsSoFar()
+{
+    return g_spins.load();
 }
 
 // ---- counted allocations ------------------------------------------------------------------------

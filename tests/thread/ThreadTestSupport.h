@@ -168,6 +168,9 @@ int WaitsSoFar();
 /// Returns once that many more waits than @p before were begun.
 void WaitForWaits(int before, int more);
 
+/// How many waits of synchronous callers have asked for a spin.
+int SpinsSoFar();
+
 /// How often the calling thread has allocated since the start of the process.
 long AllocationsSoFar();
 
