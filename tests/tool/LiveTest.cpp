@@ -184,6 +184,21 @@ TEST_F(Live, SavesPictureAndInk)
         }
 }
 
+TEST_F(Live, ThePageMayBeSavedEmptyAndOpenedAgain)
+{
+    const std::string picture = m_folder.Path("page.png"), ink = m_folder.Path("page.inkml");
+    StartSavingTo(picture);
+    TheHand().TypeWithControl(XK_s);
+    EXPECT_EQ(Nib().ReadLine(), "saved " + picture + " and " + ink);
+    ASSERT_EQ(Close().status, 0);
+
+    Start({"-o", picture, ink});
+    ExpectShown(Blank(kWidth, kHeight));
+    TheHand().Write(kBar);
+    ExpectShown(PageOf({kBar}));
+    EXPECT_NE(Close().out.find("1 strokes, 5 samples"), std::string::npos);
+}
+
 TEST_F(Live, ClosingSavesWhatIsNotSavedYet)
 {
     const std::string picture = m_folder.Path("page.png"), ink = m_folder.Path("page.inkml");
