@@ -55,7 +55,7 @@ void RectF::Union(const RectF& other) noexcept
 
 void RectF::MakeRect(float x, float y) noexcept
 {
-    Set(std::min(left, x), std::min(top, y), std::max(right, x), std::max(bottom, y));
+    *this = RectF(std::min(left, x), std::min(top, y), std::max(right, x), std::max(bottom, y));
 }
 
 void RectF::ExtendRect() noexcept

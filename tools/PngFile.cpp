@@ -3,10 +3,27 @@
 #include "ReplacementFile.h"
 
 #include <cerrno>
+#include <cstring>
 #include <png.h>
 
 namespace
 {
+
+/// Most pages are: two pixels at a time, since a page has millions.
+bool IsOpaque(const std::vector<std::uint8_t>& pixels)
+{
+    constexpr std::uint8_t kOpaque[] = {0, 0, 0, 255, 0, 0, 0, 255};
+    std::uint64_t alphas, pair;
+    std::memcpy(&alphas, kOpaque, sizeof alphas);
+    std::size_t i = 0;
+    for (; i + 8 <= pixels.size(); i += 8)
+    {
+        std::memcpy(&pair, pixels.data() + i, sizeof pair);
+        if ((pair & alphas) != alphas)
+            return false;
+    }
+    return i == pixels.size() || pixels.back() == 255;
+}
 
 std::vector<std::uint8_t> WithStraightAlpha(std::vector<std::uint8_t> pixels)
 {
@@ -29,7 +46,10 @@ std::vector<std::uint8_t> WithStraightAlpha(std::vector<std::uint8_t> pixels)
 void WritePng(const std::string& path, const std::vector<std::uint8_t>& pixels, int width,
               int height)
 {
-    const std::vector<std::uint8_t> straight = WithStraightAlpha(pixels);
+    std::vector<std::uint8_t> straight;
+    const bool isOpaque = IsOpaque(pixels);
+    if (!isOpaque)
+        straight = WithStraightAlpha(pixels);
     ReplacementFile file(path);
 
     png_image image{};
@@ -38,7 +58,8 @@ void WritePng(const std::string& path, const std::vector<std::uint8_t>& pixels, 
     image.height = static_cast<png_uint_32>(height);
     image.format = PNG_FORMAT_RGBA;
     errno = 0;
-    if (!png_image_write_to_stdio(&image, file.Stream(), 0, straight.data(), 0, nullptr))
+    if (!png_image_write_to_stdio(&image, file.Stream(), 0, (isOpaque ? pixels : straight).data(),
+                                  0, nullptr))
         file.Fail();
     file.TakePlace();
 }

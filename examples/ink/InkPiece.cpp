@@ -1,5 +1,6 @@
 #include "InkPiece.h"
 
+#include <algorithm>
 #include <cmath>
 
 namespace Ink
@@ -11,9 +12,15 @@ Nib::RectF InkPiece::Bounds() const
         return Nib::RectF();
     const float x = band.empty() ? dabs.front().x : band.front().x;
     const float y = band.empty() ? dabs.front().y : band.front().y;
-    Nib::RectF box(x, y, x, y);
+    float left = x, top = y, right = x, bottom = y; // apart, so that they stay in registers
     for (const Vertex& vertex : band)
-        box.MakeRect(vertex.x, vertex.y);
+    {
+        left = std::min(left, vertex.x);
+        top = std::min(top, vertex.y);
+        right = std::max(right, vertex.x);
+        bottom = std::max(bottom, vertex.y);
+    }
+    Nib::RectF box(left, top, right, bottom);
     for (const Dab& dab : dabs)
     {
         // A dab is turned, so that its corners are anywhere within its half diagonal.

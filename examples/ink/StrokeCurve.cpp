@@ -118,7 +118,12 @@ void StrokeCurve::AddPiece(const PenPoint& before, const PenPoint& from, const P
 
 float Distance(const PenPoint& a, const PenPoint& b)
 {
-    return std::hypot(b.x - a.x, b.y - a.y);
+    return Length(b.x - a.x, b.y - a.y);
+}
+
+float Length(float x, float y)
+{
+    return static_cast<float>(std::sqrt(double(x) * x + double(y) * y));
 }
 
 PenPoint Between(const PenPoint& a, const PenPoint& b, float t)
@@ -129,7 +134,11 @@ PenPoint Between(const PenPoint& a, const PenPoint& b, float t)
     point.y = between(a.y, b.y);
     point.radius = between(a.radius, b.radius);
     point.flow = between(a.flow, b.flow);
-    point.angle = a.angle + t * std::remainder(b.angle - a.angle, kTurn); // the short way round
+    const float turn = b.angle - a.angle;
+    if (turn == 0.0f)
+        point.angle = a.angle;
+    else
+        point.angle = a.angle + t * std::remainder(turn, kTurn); // the short way round
     point.stretch = between(a.stretch, b.stretch);
     return point;
 }

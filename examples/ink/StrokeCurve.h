@@ -48,6 +48,9 @@ private:
 
 float Distance(const PenPoint& a, const PenPoint& b);
 
+/// The length of a vector; squared in double, so that it overflows nowhere.
+float Length(float x, float y);
+
 /// What @p a becomes on its way to @p b, in a straight line, after the share @p t of it.
 PenPoint Between(const PenPoint& a, const PenPoint& b, float t);
 

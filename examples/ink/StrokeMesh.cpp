@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 
 namespace Ink
 {
@@ -75,27 +76,26 @@ void StrokeMesh::AddPlaces(std::vector<Vertex>& triangles)
 void StrokeMesh::AddSection(const CurvePlace& place, std::vector<Vertex>& triangles)
 {
     const PenPoint& centre = place.at;
-    Section section{centre, m_last.normalX, m_last.normalY};
-    const float length = std::hypot(place.directionX, place.directionY);
+    Section section{centre, m_last.normalX, m_last.normalY, {}, {}};
+    const float length = Length(place.directionX, place.directionY);
     if (length > 0.0f)
     {
         section.normalX = -place.directionY / length;
         section.normalY = place.directionX / length;
     }
-    const auto corner = [](const Section& at, float side)
-    {
-        const float reach = side * (at.centre.radius + kFade);
-        return Vertex{at.centre.x + at.normalX * reach, at.centre.y + at.normalY * reach, -kFade};
-    };
+    const float reach = centre.radius + kFade;
+    const float acrossX = section.normalX * reach, acrossY = section.normalY * reach;
+    section.left = {centre.x + acrossX, centre.y + acrossY, -kFade};
+    section.right = {centre.x - acrossX, centre.y - acrossY, -kFade};
     if (m_hasSection)
     {
         const Vertex lastMiddle{m_last.centre.x, m_last.centre.y, m_last.centre.radius};
         const Vertex middle{centre.x, centre.y, centre.radius};
-        for (const float side : {1.0f, -1.0f})
-        {
-            AddTriangle(triangles, corner(m_last, side), lastMiddle, middle);
-            AddTriangle(triangles, corner(m_last, side), middle, corner(section, side));
-        }
+        const Vertex band[] = {m_last.left,  lastMiddle, middle, //
+                               m_last.left,  middle,     section.left,
+                               m_last.right, lastMiddle, middle, //
+                               m_last.right, middle,     section.right};
+        triangles.insert(triangles.end(), std::begin(band), std::end(band));
         const float turn = m_last.normalX * section.normalX + m_last.normalY * section.normalY;
         if (turn < kSharpTurn)
             AddDisc(m_last.centre, triangles);

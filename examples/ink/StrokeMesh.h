@@ -42,6 +42,7 @@ private:
         PenPoint centre;
         float normalX = 0.0f;
         float normalY = 0.0f;
+        Vertex left, right; ///< the corners of the band
     };
 
     void AddPlaces(std::vector<Vertex>& triangles);
