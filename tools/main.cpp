@@ -1,3 +1,4 @@
+#include "BenchCommand.h"
 #include "CacheCommand.h"
 #include "DrawCommand.h"
 #include "Drawing.h"
@@ -47,6 +48,7 @@ int main(int argc, char** argv)
     AddInfoCommand(app);
     AddLatencyCommand(app);
     AddCacheCommand(app);
+    AddBenchCommand(app);
     try
     {
         app.parse(argc, argv);
