@@ -9,20 +9,19 @@
 namespace
 {
 
-/// Most pages are: two pixels at a time, since a page has millions.
+/// Most pages are: eight bytes at a time and without a branch, since a page has millions.
 bool IsOpaque(const std::vector<std::uint8_t>& pixels)
 {
     constexpr std::uint8_t kOpaque[] = {0, 0, 0, 255, 0, 0, 0, 255};
-    std::uint64_t alphas, pair;
-    std::memcpy(&alphas, kOpaque, sizeof alphas);
+    std::uint64_t opaque, pair, common = ~std::uint64_t{0};
+    std::memcpy(&opaque, kOpaque, sizeof opaque);
     std::size_t i = 0;
-    for (; i + 8 <= pixels.size(); i += 8)
+    for (; i + sizeof pair <= pixels.size(); i += sizeof pair)
     {
         std::memcpy(&pair, pixels.data() + i, sizeof pair);
-        if ((pair & alphas) != alphas)
-            return false;
+        common &= pair;
     }
-    return i == pixels.size() || pixels.back() == 255;
+    return (common & opaque) == opaque && (i == pixels.size() || pixels.back() == 255);
 }
 
 std::vector<std::uint8_t> WithStraightAlpha(std::vector<std::uint8_t> pixels)
