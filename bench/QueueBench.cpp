@@ -19,6 +19,7 @@
 
 #include <linux/futex.h>
 #include <sched.h>
+#include <sys/resource.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
@@ -98,6 +99,31 @@ struct Stroke
     double pressure = 0;
 
     void operator()() const { benchmark::DoNotOptimize(this); }
+};
+
+/// Switches of this process between its threads, told as so many for each call.
+class Switches
+{
+public:
+    explicit Switches(benchmark::State& state) : m_state(state), m_before(SoFar()) {}
+    ~Switches()
+    {
+        m_state.counters["switches"] =
+            static_cast<double>(SoFar() - m_before) / static_cast<double>(m_state.iterations());
+    }
+    Switches(const Switches&) = delete;
+    Switches& operator=(const Switches&) = delete;
+
+private:
+    static long SoFar()
+    {
+        rusage usage{};
+        getrusage(RUSAGE_SELF, &usage);
+        return usage.ru_nvcsw + usage.ru_nivcsw;
+    }
+
+    benchmark::State& m_state;
+    long m_before;
 };
 
 // ---- a post to a busy worker --------------------------------------------------------------------
@@ -253,7 +279,9 @@ void BM_SyncCall(benchmark::State& state)
     const int processor = static_cast<int>(state.range(0));
     Executor executor(1);
     executor.Post([processor] { PinTo(processor); });
+    CallAndWait(executor); // now both are where they belong
     Samples samples(state);
+    const Switches switches(state);
     for (auto _ : state)
     {
         const Clock::time_point begin = Clock::now();
@@ -280,6 +308,7 @@ void BM_SyncCallBareFutex(benchmark::State& state)
             }
         });
     Samples samples(state);
+    const Switches switches(state);
     int turn = 0;
     for (auto _ : state)
     {
