@@ -104,9 +104,9 @@ void BM_PauseResume(benchmark::State& state)
         subscribed.observer.DispatchRelease();
         subscribed.observer.DispatchRestore();
     }
-    state.counters["an_object"] = benchmark::Counter(
-        static_cast<double>(state.iterations() * state.range(0)),
-        benchmark::Counter::kIsRate | benchmark::Counter::kInvert);
+    state.counters["an_object"] =
+        benchmark::Counter(static_cast<double>(state.iterations() * state.range(0)),
+                           benchmark::Counter::kIsRate | benchmark::Counter::kInvert);
 }
 
 /// A name that the leak checker gets and loses.
