@@ -13,6 +13,7 @@ namespace
 constexpr int kWidth = 1280;
 constexpr int kHeight = 800;
 constexpr int kStrokes = 30;
+constexpr int kStrokesOfARow = 5;
 constexpr int kSamplesOfAStroke = 75; // as many as a tablet reports in half a second
 
 /// Loops in rows, as handwriting has them.
@@ -21,8 +22,9 @@ Ink::Recording MadeUpStrokes()
     Ink::Recording recording;
     for (int stroke = 0; stroke < kStrokes; ++stroke)
     {
-        const float left = 40.0f + 240.0f * static_cast<float>(stroke % 5);
-        const float middle = 90.0f + 125.0f * static_cast<float>(stroke / 5);
+        const int row = stroke / kStrokesOfARow, column = stroke % kStrokesOfARow;
+        const float left = 40.0f + 240.0f * static_cast<float>(column);
+        const float middle = 90.0f + 125.0f * static_cast<float>(row);
         Ink::Stroke samples;
         for (int i = 0; i < kSamplesOfAStroke; ++i)
         {
