@@ -1,5 +1,6 @@
 #include "base/Log.h"
 #include "debug/CheckerLock.h"
+#include "device/GlDebugOutput.h"
 
 #include <nib/base.h>
 #include <nib/msg_queue.h>
@@ -49,6 +50,20 @@ struct Caller
     IGLMsgQueue* queue;
     void* context;
 };
+
+/// What a GL debugger calls such a name; 0 for a type that is none of the five.
+GLenum LabelledKind(ResourceChecker::DescriptorType type)
+{
+    switch (type)
+    {
+    case ResourceChecker::DescriptorType::Texture: return GL_TEXTURE;
+    case ResourceChecker::DescriptorType::Sampler: return GL_SAMPLER_KHR;
+    case ResourceChecker::DescriptorType::FrameBuffer: return GL_FRAMEBUFFER;
+    case ResourceChecker::DescriptorType::RenderBuffer: return GL_RENDERBUFFER;
+    case ResourceChecker::DescriptorType::VertexBuffer: return GL_BUFFER_KHR;
+    }
+    return 0;
+}
 
 const char* QueueName(IGLMsgQueue* queue)
 {
@@ -197,6 +212,8 @@ void ResourceChecker::updateTagLookup(unsigned int id, const char* tag, dbDescri
         return;
     }
     item->tag = tag != nullptr ? tag : "";
+    if (const GLenum kind = LabelledKind(db.type))
+        GlDebugOutput::Label(kind, id, tag);
 }
 
 // ---- contexts -----------------------------------------------------------------------------------

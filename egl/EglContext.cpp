@@ -1,4 +1,5 @@
 #include <nib/egl.h>
+#include <nib/gl_debug.h>
 #include <nib/trace.h>
 
 #include "base/Log.h"
@@ -6,6 +7,13 @@
 
 namespace Nib
 {
+
+namespace
+{
+
+constexpr int kMostAttributes = 7; // three, and the end of the list
+
+} // namespace
 
 bool EglContext::Create(const EGLContext shareContext, bool enableFrontBuffer, Priority priority)
 {
@@ -20,13 +28,15 @@ bool EglContext::Create(const EGLContext shareContext, bool enableFrontBuffer, P
         NIB_LOG_INFO("%s, Shared context client version %i", function, version);
     }
 
-    EGLint attributes[] = {EGL_CONTEXT_CLIENT_VERSION, version, EGL_NONE, EGL_NONE, EGL_NONE};
+    EGLint attributes[kMostAttributes] = {EGL_CONTEXT_CLIENT_VERSION, version, EGL_NONE};
+    EGLint* end = attributes + 2;
     if (egl->IsEglExtensionSupported("EGL_IMG_context_priority"))
     {
         NIB_LOG_INFO("%s, Create context with priority: 0x%x", function,
                      static_cast<unsigned>(priority));
-        attributes[2] = EGL_CONTEXT_PRIORITY_LEVEL_IMG;
-        attributes[3] = static_cast<EGLint>(priority);
+        *end++ = EGL_CONTEXT_PRIORITY_LEVEL_IMG;
+        *end++ = static_cast<EGLint>(priority);
+        *end = EGL_NONE;
     }
 
     const EGLConfig config = egl->GetConfig(enableFrontBuffer);
@@ -36,7 +46,17 @@ bool EglContext::Create(const EGLContext shareContext, bool enableFrontBuffer, P
                       enableFrontBuffer ? "true" : "false");
         return false;
     }
-    m_context = eglCreateContext(egl->GetDisplay(), config, shareContext, attributes);
+    m_context = EGL_NO_CONTEXT;
+    if (GlDebug::IsEnabled() && egl->IsEglExtensionSupported("EGL_KHR_create_context"))
+    {
+        end[0] = EGL_CONTEXT_FLAGS_KHR;
+        end[1] = EGL_CONTEXT_OPENGL_DEBUG_BIT_KHR;
+        end[2] = EGL_NONE;
+        m_context = eglCreateContext(egl->GetDisplay(), config, shareContext, attributes);
+        *end = EGL_NONE; // should it be refused
+    }
+    if (m_context == EGL_NO_CONTEXT)
+        m_context = eglCreateContext(egl->GetDisplay(), config, shareContext, attributes);
     if (m_context == EGL_NO_CONTEXT)
     {
         NIB_LOG_ERROR("%s: eglCreateContext. Error:%d", function, eglGetError());

@@ -3,6 +3,7 @@
 #include <nib/device.h>
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 
 #include <GLES3/gl3.h>
 
@@ -52,6 +53,7 @@ void DepthStencilBuffer::CreateBuffer(unsigned int width, unsigned int height)
         glBindRenderbuffer(GL_RENDERBUFFER, m_renderbuffer);
         glRenderbufferStorage(GL_RENDERBUFFER, GL_DEPTH24_STENCIL8, static_cast<GLsizei>(width),
                               static_cast<GLsizei>(height));
+        GlDebugOutput::Label(GL_RENDERBUFFER, m_renderbuffer, "depth and stencil");
         m_width = width;
         m_height = height;
     }

@@ -4,11 +4,13 @@
 #include <nib/exceptions.h>
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "gles/Throw.h"
 #include "gles/VertexFormats.h"
 
 #include <algorithm>
 #include <memory>
+#include <string>
 
 namespace Nib::GLES
 {
@@ -118,7 +120,20 @@ void GraphicsObject::CreateBuffer(PrimitiveType mode, unsigned int bufferCount,
     m_indexCount = indexCount;
     m_bufferCount = bufferCount;
     m_mode = mode;
+    LabelBuffers();
     Register();
+}
+
+/// For a GL debugger.
+void GraphicsObject::LabelBuffers() const
+{
+    if (!GlDebugOutput::IsOn())
+        return;
+    for (unsigned i = 0; i < m_bufferCount; ++i)
+        GlDebugOutput::Label(GL_BUFFER_KHR, m_vertexBuffers[i],
+                             ("vertices " + std::to_string(i)).c_str());
+    if (m_indexBuffer != 0)
+        GlDebugOutput::Label(GL_BUFFER_KHR, m_indexBuffer, "indices");
 }
 
 void GraphicsObject::setMeshType(PrimitiveType mode)
@@ -150,6 +165,7 @@ void GraphicsObject::UpdateIndexes(const void* data, unsigned int count)
         UploadIndices(data, count);
     else
         UploadShortIndices(data, count);
+    GlDebugOutput::Label(GL_BUFFER_KHR, m_indexBuffer, "indices");
     m_indexCount = count;
 }
 
@@ -300,6 +316,7 @@ void GraphicsObject::RestoreGLObject()
     if (m_indexBuffer == 0)
         m_indexBuffer = MakeIndexBuffer(m_indexCount);
     glBindBuffer(GL_ARRAY_BUFFER, 0);
+    LabelBuffers();
     NIB_LOG_INFO("%s - Restore Was called. Graphics After - %d(err:%d)", function,
                  static_cast<int>(m_vertexBuffers[0]), static_cast<int>(glGetError()));
 }

@@ -56,6 +56,7 @@ public:
     void RestoreGLObject() override;
 
 private:
+    void LabelBuffers() const;
     /// What the index buffer holds; how it is told to GL.
     struct IndexFormat
     {

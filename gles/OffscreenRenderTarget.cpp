@@ -1,6 +1,7 @@
 #include "gles/OffscreenRenderTarget.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "gles/DepthStencilBuffer.h"
 #include "gles/TextureObject.h"
 #include "gles/Throw.h"
@@ -69,6 +70,7 @@ void OffscreenRenderTarget::AttachColorToFbo()
     const GLuint texture = TextureNameOf(m_color);
     glBindTexture(GL_TEXTURE_2D, 0);
     glBindFramebuffer(GL_FRAMEBUFFER, fbo);
+    GlDebugOutput::Label(GL_FRAMEBUFFER, fbo, m_color->GetTag());
     glFramebufferTexture2D(GL_FRAMEBUFFER, GL_COLOR_ATTACHMENT0, GL_TEXTURE_2D, texture, 0);
     const GLenum status = glCheckFramebufferStatus(GL_FRAMEBUFFER);
     if (status == GL_FRAMEBUFFER_COMPLETE)

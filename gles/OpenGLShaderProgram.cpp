@@ -1,11 +1,13 @@
 #include "gles/OpenGLShaderProgram.h"
 
 #include "gles/AttributeScanner.h"
+#include "gles/CacheFileNames.h"
 #include "gles/ParameterBindingImpl.h"
 #include "gles/Throw.h"
 #include "gles/UniformName.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 
 #include <nib/exceptions.h>
 #include <nib/trace.h>
@@ -151,7 +153,7 @@ void OpenGLShaderProgram::createShader()
     {
         NIB_LOG_INFO("%s - Binary shader exists in cache", function);
         if (LoadFromBinary(binary.get()))
-            return;
+            return Label();
         NIB_LOG_ERROR("%s - cached binary shader is not valid. Need to recreate it in cache",
                       function);
         m_cachedBinary.reset();
@@ -160,6 +162,16 @@ void OpenGLShaderProgram::createShader()
     std::vector<std::string> attributes;
     createShaderFromSource(attributes);
     SaveToCache(key, attributes);
+    Label();
+}
+
+/// For a GL debugger: the program's file in the cache.
+void OpenGLShaderProgram::Label() const
+{
+    if (!GlDebugOutput::IsOn())
+        return;
+    const auto key = ShaderProgramCache::GetShaderKey(m_vertexSource, m_fragmentSource);
+    GlDebugOutput::Label(GL_PROGRAM_KHR, m_program, ShaderFileName(key).c_str());
 }
 
 // The binary that an earlier build found, unless the cache has replaced it since.

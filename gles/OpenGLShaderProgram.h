@@ -53,6 +53,7 @@ private:
     using BinaryShader = ShaderProgramCache::BinaryShader;
 
     void createShader();
+    void Label() const;
     void createShaderFromSource(std::vector<std::string>& attributes);
     void LinkShaders(GLuint vertex, GLuint fragment, std::vector<std::string>& attributes);
     void parseShaderFromSource(std::vector<std::string>& attributes) const;

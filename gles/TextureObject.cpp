@@ -4,6 +4,7 @@
 #include <nib/exceptions.h>
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "device/TextureFormats.h"
 #include "device/TextureLimits.h"
 #include "gles/TextureAccounting.h"
@@ -338,6 +339,14 @@ void TextureObject::SetTag(const char* tag)
                   static_cast<int>(length), m_internals.tag);
     std::memmove(m_internals.tag, tag, length); // it may be the texture's own
     m_internals.tag[length] = '\0';
+    Label();
+}
+
+/// For a GL debugger. An alias is another handle of a texture that has its label.
+void TextureObject::Label() const
+{
+    if (!IsAlias() && m_internals.glID != 0)
+        GlDebugOutput::Label(GL_TEXTURE, m_internals.glID, m_internals.tag);
 }
 
 const char* TextureObject::GetTag() const

@@ -90,6 +90,7 @@ private:
                                            const Params& params);
 
     bool IsAlias() const { return m_internals.descriptor.source != nullptr; }
+    void Label() const;
     void BorrowNames() const;
     void WaitForUpload() const;
     void Bind() const;

@@ -1,6 +1,7 @@
 #include "gles/UniformBuffer.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "gles/VertexFormats.h"
 
 namespace Nib::GLES
@@ -20,6 +21,7 @@ UniformBuffer::UniformBuffer()
     // The array buffer, not the uniform buffer, which gets its storage from the first Update.
     glBufferData(GL_ARRAY_BUFFER, 0, nullptr, GetBufferUsage(m_usage));
     glBindBuffer(GL_UNIFORM_BUFFER, 0);
+    GlDebugOutput::Label(GL_BUFFER_KHR, m_buffer, "uniforms");
 }
 
 void UniformBuffer::Release()

@@ -1,6 +1,7 @@
 #include "render/HWUIThreadGLImpl.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "render/NewTask.h"
 #include "thread/TaskScope.h"
 
@@ -54,6 +55,7 @@ HWUIThreadGLImpl::HWUIThreadGLImpl(HwuiCallback* callback, const char* tag)
 void HWUIThreadGLImpl::Init()
 {
     NIB_FUNCTION("void Nib::GLES::HWUIThreadGLImpl::Init()");
+    GlDebugOutput::Attach(GlDebugOutput::Owner::Borrowed);
     OpenGLRenderer::InitParameters();
     NIB_LOG_INFO("%s RenderThread: %p, Context: %p", function, static_cast<void*>(this),
                  eglGetCurrentContext());
@@ -71,6 +73,7 @@ HWUIThreadGLImpl::~HWUIThreadGLImpl()
         NIB_LOG_INFO("OnTrim was detected, printing resources left in database");
     else
         NIB_LOG_INFO("OnTrim not detected, checking for leaks");
+    GlDebugOutput::Detach();
     if (m_observer->Release())
         ShaderManager::GetInstance()->CheckEmpty();
     if (GetCurrentMsgQueue() == this)

@@ -1,6 +1,7 @@
 #include "render/RenderSteps.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "render/NewTask.h"
 
 #include <nib/device.h>
@@ -25,6 +26,7 @@ void BindToQueue(IGLMsgQueue* queue, const void* self, const EglContext& context
                  const char* function)
 {
     AttachToThread(queue);
+    GlDebugOutput::Attach(GlDebugOutput::Owner::RenderThread);
     OpenGLRenderer::InitParameters();
     NIB_LOG_INFO("%s RenderThread: %p, Context: %p", function, self, context.Get());
 }
@@ -43,6 +45,7 @@ void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, E
     observer.DispatchRelease();
     ShaderManager::GetInstance()->OnDestroyContext();
     worker.Pause(); // from the end of the running task on
+    GlDebugOutput::Detach();
     Egl::GetInstance()->MakeCurrent(nullptr, nullptr);
     context.Destroy();
 }
@@ -50,6 +53,7 @@ void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, E
 void RestoreObjects(Observer<IManagedObject>& observer, const char* function)
 {
     const TraceScope trace("context", "restore");
+    GlDebugOutput::Attach(GlDebugOutput::Owner::RenderThread);
     observer.DispatchRestore(
         [function](const std::exception& failure)
         { NIB_LOG_ERROR("%s An object is not restored: %s", function, failure.what()); });

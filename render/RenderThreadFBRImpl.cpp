@@ -1,6 +1,7 @@
 #include "render/RenderThreadFBRImpl.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "egl/EglTokens.h"
 #include "render/NewTask.h"
 #include "render/TaskFlags.h"
@@ -123,6 +124,7 @@ void RenderThreadFBRImpl::DoTerminate()
     NIB_FUNCTION("void Nib::GLES::RenderThreadFBRImpl::DoTerminate()");
     NIB_LOG_INFO("%s RenderThread: %p, Context: %p", function, static_cast<void*>(this),
                  m_context.Get());
+    GlDebugOutput::Detach();
     Egl::GetInstance()->MakeCurrent(nullptr, nullptr);
     m_surface.Destroy();
     m_context.Destroy();

@@ -1,6 +1,7 @@
 #include "render/RenderThreadGLImpl.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "render/NewTask.h"
 #include "render/RenderSteps.h"
 #include "render/TaskFlags.h"
@@ -96,6 +97,7 @@ void RenderThreadGLImpl::DoTerminate()
     NIB_FUNCTION("void Nib::GLES::RenderThreadGLImpl::DoTerminate()");
     NIB_LOG_INFO("%s RenderThread: %p, Context: %p", function, static_cast<void*>(this),
                  m_context.Get());
+    GlDebugOutput::Detach();
     Egl::GetInstance()->MakeCurrent(nullptr, nullptr);
     m_surface.Destroy();
     m_context.Destroy();

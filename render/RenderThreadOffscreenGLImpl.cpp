@@ -1,6 +1,7 @@
 #include "render/RenderThreadOffscreenGLImpl.h"
 
 #include "base/Log.h"
+#include "device/GlDebugOutput.h"
 #include "render/NewTask.h"
 #include "render/TaskFlags.h"
 
@@ -146,6 +147,7 @@ void RenderThreadOffscreenGLImpl::DoTerminate()
     NIB_FUNCTION("void Nib::GLES::RenderThreadOffscreenGLImpl::DoTerminate()");
     NIB_LOG_INFO("%s RenderThread: %p, Context: %p", function, static_cast<void*>(this),
                  m_context.Get());
+    GlDebugOutput::Detach();
     Egl::GetInstance()->MakeCurrent(nullptr, nullptr);
     m_surface.reset();
     m_context.Destroy();

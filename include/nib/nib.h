@@ -11,6 +11,7 @@
 #include <nib/exceptions.h>
 #include <nib/export.h>
 #include <nib/geometry.h>
+#include <nib/gl_debug.h>
 #include <nib/log.h>
 #include <nib/managed_object.h>
 #include <nib/matrix.h>

@@ -121,6 +121,10 @@ public:
     void SetConfigCounts(int counted, int given);
     /// eglQueryAPI answers this on threads that bound nothing (EGL_OPENGL_ES_API otherwise).
     void SetInitialApi(EGLenum api);
+    /// The driver has this to say, inside a call of the calling thread (GL_KHR_debug).
+    /// @return whether the thread's context wanted to know; its callback has then returned
+    bool SendDebugMessage(GLenum source, GLenum type, GLuint id, GLenum severity,
+                          const std::string& text);
     /// The next compilation or link fails with this info log. Sources that hold "#error text"
     /// always fail.
     void FailCompile(std::string log);

@@ -59,6 +59,12 @@ bool ReadRequest(EglEntry& entry, const EGLint* list, ContextRequest& request)
                 return entry.Misuse(EGL_BAD_ATTRIBUTE, "no such context priority");
             request.priority = list[1];
             break;
+        case EGL_CONTEXT_FLAGS_KHR:
+            if (!entry.state.gpu.HasEglExtension("EGL_KHR_create_context"))
+                return entry.Misuse(EGL_BAD_ATTRIBUTE, "there are no context flags");
+            if (list[1] != EGL_CONTEXT_OPENGL_DEBUG_BIT_KHR)
+                return entry.Misuse(EGL_BAD_ATTRIBUTE, "no such context flags");
+            break;
         default:
             return entry.Misuse(EGL_BAD_ATTRIBUTE,
                                 "no such attribute: " + Hex(static_cast<unsigned>(list[0])));

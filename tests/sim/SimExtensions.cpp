@@ -26,6 +26,7 @@ struct Row
 
 constexpr const char* kFenceSync = "EGL_KHR_fence_sync";
 constexpr const char* kTimestamps = "EGL_ANDROID_get_frame_timestamps";
+constexpr const char* kDebug = "GL_KHR_debug";
 constexpr const char* kTiling = "GL_QCOM_tiled_rendering";
 
 const Row* FindRow(const char* name)
@@ -46,6 +47,11 @@ const Row* FindRow(const char* name)
         SIM_ROW("EGL_ANDROID_presentation_time", eglPresentationTimeANDROID),
         SIM_ROW(kTiling, glStartTilingQCOM),
         SIM_ROW(kTiling, glEndTilingQCOM),
+        SIM_ROW(kDebug, glDebugMessageCallbackKHR),
+        SIM_ROW(kDebug, glDebugMessageControlKHR),
+        SIM_ROW(kDebug, glPushDebugGroupKHR),
+        SIM_ROW(kDebug, glPopDebugGroupKHR),
+        SIM_ROW(kDebug, glObjectLabelKHR),
     };
     for (const Row& row : rows)
     {

@@ -33,6 +33,13 @@ EGLBoolean eglPresentationTimeANDROID(EGLDisplay, EGLSurface, EGLnsecsANDROID ti
 void glStartTilingQCOM(GLuint x, GLuint y, GLuint width, GLuint height, GLbitfield preserveMask);
 void glEndTilingQCOM(GLbitfield preserveMask);
 
+void glDebugMessageCallbackKHR(GLDEBUGPROCKHR callback, const void* user);
+void glDebugMessageControlKHR(GLenum source, GLenum type, GLenum severity, GLsizei count,
+                              const GLuint* ids, GLboolean enabled);
+void glPushDebugGroupKHR(GLenum source, GLuint id, GLsizei length, const GLchar* message);
+void glPopDebugGroupKHR();
+void glObjectLabelKHR(GLenum identifier, GLuint name, GLsizei length, const GLchar* label);
+
 } // namespace Sim::Extension
 
 #endif

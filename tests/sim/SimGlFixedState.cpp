@@ -34,7 +34,9 @@ bool Check(GlEntry& entry, bool valid, const char* what, GLenum value)
 
 bool CheckCapability(GlEntry& entry, GLenum name)
 {
-    return Check(entry, IsCapability(name), "capability", name);
+    const bool isDebug = entry.state.gpu.HasGlExtension("GL_KHR_debug") &&
+                         IsOneOf(name, {GL_DEBUG_OUTPUT_KHR, GL_DEBUG_OUTPUT_SYNCHRONOUS_KHR});
+    return Check(entry, isDebug || IsCapability(name), "capability", name);
 }
 
 bool CheckEquation(GlEntry& entry, GLenum mode)

@@ -4,6 +4,10 @@
 #include "SimImage.h"
 #include "SimObjects.h"
 
+#include <GLES3/gl3.h>
+// After gl3.h, which it needs.
+#include <GLES2/gl2ext.h>
+
 #include <array>
 #include <deque>
 #include <map>
@@ -204,6 +208,15 @@ struct StencilFace
     GLenum pass = GL_KEEP;
 };
 
+/// What GL_KHR_debug adds to a context.
+struct DebugOutput
+{
+    GLDEBUGPROCKHR callback = nullptr;
+    const void* user = nullptr;
+    bool tellsLow = false; // messages of low severity have to be asked for
+    int groups = 0;
+};
+
 struct BufferRange
 {
     GLuint buffer = 0;
@@ -271,6 +284,7 @@ struct GlState
     bool feedbackActive = false;
     GLenum defaultReadBuffer = GL_BACK;
     std::vector<GLenum> defaultDrawBuffers{GL_BACK};
+    DebugOutput debug;
     std::optional<Box> tiling; // between glStartTilingQCOM and glEndTilingQCOM: where is drawn
 
     GlState() { currentAttribs.fill({0, 0, 0, 1}); }
