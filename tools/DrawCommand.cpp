@@ -68,6 +68,8 @@ void AddDrawCommand(CLI::App& app, std::function<void(const DrawOptions&)> run)
         ->check(CLI::Range(1, 10000));
     draw->add_option("--lose-context", options->loseContext,
                      "Draw on a background thread that loses its GL context; every:N samples");
+    draw->add_option("--trace", options->trace,
+                     "Write what each thread does, and when, into this file, which Perfetto opens");
     for (const char* replay :
          {"--window", "--speed", "--keep", "--json", "--export", "--lose-context"})
         live->excludes(replay);

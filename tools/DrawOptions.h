@@ -22,6 +22,7 @@ struct DrawOptions
         speed;               ///< else the recorded one in a window, and no frames elsewhere
     std::string json;        ///< "-": standard output; a file; empty: none
     std::string loseContext; ///< "every:N"
+    std::string trace;       ///< a file; empty: none
     int exportedPages = 0;
     bool window = false;
     bool live = false;

@@ -6,6 +6,7 @@
 #include "LatencyCommand.h"
 #include "LiveDrawing.h"
 #include "Recording.h"
+#include "TraceOption.h"
 #include "UserError.h"
 
 #include <nib/version.h>
@@ -23,10 +24,12 @@ constexpr int kUserErrorStatus = 2;
 
 void Draw(const DrawOptions& options)
 {
+    TraceOption trace(options.trace);
     if (options.live)
         LiveDrawing(options).Run();
     else
         Drawing(options).Run();
+    trace.Finish();
 }
 
 int Fail(const std::exception& failure)

@@ -2,6 +2,8 @@
 
 #include "InkPainter.h"
 
+#include <nib/trace.h>
+
 #include <algorithm>
 #include <exception>
 #include <utility>
@@ -116,7 +118,12 @@ void InkSession::Draw(InkPiece piece)
     if (piece.IsEmpty())
         return;
     m_dirty.Union(piece.Bounds());
-    PostGuarded([piece = std::move(piece)](GlState& gl) { gl.painter.Paint(piece, *gl.page); });
+    PostGuarded(
+        [piece = std::move(piece)](GlState& gl)
+        {
+            const Nib::TraceScope trace("ink", piece.startsStroke ? "begin stroke" : "paint");
+            gl.painter.Paint(piece, *gl.page);
+        });
 }
 
 namespace
@@ -140,6 +147,7 @@ void InkSession::Present()
     Nib::RectF visible(0.0f, 0.0f, static_cast<float>(m_width), static_cast<float>(m_height));
     if (m_dirty.IsEmpty() || !visible.Intersect(m_dirty))
         visible.Set(0.0f, 0.0f, 0.0f, 0.0f);
+    const Nib::TraceScope whole("ink", "present");
     visible.ExtendRect(); // a fraction of a pixel would not be presented
     m_dirty.Set(0.0f, 0.0f, 0.0f, 0.0f);
 
@@ -147,6 +155,7 @@ void InkSession::Present()
     PostGuarded(
         [visible](GlState& gl)
         {
+            const Nib::TraceScope trace("ink", "view");
             if (gl.view)
                 gl.view->Draw(gl.page->Texture(), visible);
         });

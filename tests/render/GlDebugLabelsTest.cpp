@@ -1,5 +1,6 @@
 // What the library's objects are called in a GL debugger.
 
+#include "gles/CacheFiles.h"
 #include "render/SurfaceThreadSupport.h"
 
 #include <nib/base.h>
@@ -50,8 +51,8 @@ Texts NewLabels(SimDriver& driver)
     for (const SimCall& call : driver.Calls("glObjectLabelKHR"))
     {
         const std::string text = call.args.at(3).Text();
-        labels.push_back(KindName(call.Arg(0)) + " " + text.substr(0, static_cast<std::size_t>(
-                                                                          call.Arg(2))));
+        labels.push_back(KindName(call.Arg(0)) + " " +
+                         text.substr(0, static_cast<std::size_t>(call.Arg(2))));
     }
     driver.ForgetCalls();
     return labels;
@@ -77,6 +78,7 @@ protected:
         return RendererFactory::CreateTextureObject(descriptor, nullptr, nullptr, 0, nullptr);
     }
 
+    const CacheFolder m_cache;
     SimDriver m_driver{SimGpu::Default().WithGlExtension("GL_KHR_debug")};
     std::unique_ptr<RenderThreadGL> m_thread;
 };

@@ -142,11 +142,11 @@ TEST_F(GlDebugTest, TheDriversMessagesAreLinesAtMatchingLevelsOnTheThreadThatCau
               m_driver.SendDebugMessage(GL_DEBUG_SOURCE_API_KHR, GL_DEBUG_TYPE_PORTABILITY_KHR, 9,
                                         GL_DEBUG_SEVERITY_NOTIFICATION_KHR, "elsewhere not");
           });
-    EXPECT_EQ(LinesWith(m_driver, "GL "),
-              Texts({"E GL API, error 0x502: no program",
-                     "W GL shader compiler, performance 0x7: many registers",
-                     "I GL driver, message 0x8: 100% busy",
-                     "D GL API, portability 0x9: elsewhere not"}));
+    EXPECT_EQ(
+        LinesWith(m_driver, "GL "),
+        Texts({"E GL API, error 0x502: no program",
+               "W GL shader compiler, performance 0x7: many registers",
+               "I GL driver, message 0x8: 100% busy", "D GL API, portability 0x9: elsewhere not"}));
     for (const SimLogLine& line : m_driver.Log())
         EXPECT_EQ(line.thread, renderThread) << line;
 }

@@ -1,8 +1,6 @@
 #include "SimExtensions.h"
 #include "SimGl.h"
 
-
-
 // GL_KHR_debug: messages, groups and labels. A test sends the messages; groups and labels are seen
 // in the recorded calls.
 
