@@ -9,6 +9,8 @@
 
 #include <cstring>
 #include <mutex>
+#include <sstream>
+#include <string>
 
 namespace Nib
 {
@@ -50,14 +52,14 @@ bool Resolve(const char* function)
 
 // ---- the driver's messages ----------------------------------------------------------------------
 
-android_LogPriority PriorityOf(GLenum severity)
+void Log(GLenum severity, const std::string& text)
 {
     switch (severity)
     {
-    case GL_DEBUG_SEVERITY_HIGH_KHR: return ANDROID_LOG_ERROR;
-    case GL_DEBUG_SEVERITY_MEDIUM_KHR: return ANDROID_LOG_WARN;
-    case GL_DEBUG_SEVERITY_LOW_KHR: return ANDROID_LOG_INFO;
-    default: return ANDROID_LOG_DEBUG;
+    case GL_DEBUG_SEVERITY_HIGH_KHR: NIB_LOG_ERROR("GL %s", text.c_str()); break;
+    case GL_DEBUG_SEVERITY_MEDIUM_KHR: NIB_LOG_WARN("GL %s", text.c_str()); break;
+    case GL_DEBUG_SEVERITY_LOW_KHR: NIB_LOG_INFO("GL %s", text.c_str()); break;
+    default: NIB_LOG_DEBUG("GL %s", text.c_str()); break;
     }
 }
 
@@ -94,11 +96,12 @@ void GL_APIENTRY LogMessage(GLenum source, GLenum type, GLuint id, GLenum severi
 {
     if (type == GL_DEBUG_TYPE_PUSH_GROUP_KHR || type == GL_DEBUG_TYPE_POP_GROUP_KHR)
         return; // our own
-    std::size_t length = std::strlen(text);
-    while (length > 0 && text[length - 1] == '\n')
-        --length;
-    __android_log_print(PriorityOf(severity), kLogTag, "GL %s, %s 0x%X: %.*s", SourceName(source),
-                        TypeName(type), id, static_cast<int>(length), text);
+    std::ostringstream line;
+    line << SourceName(source) << ", " << TypeName(type) << " 0x" << std::uppercase << std::hex
+         << id << ": " << text;
+    std::string message = line.str();
+    message.erase(message.find_last_not_of('\n') + 1);
+    Log(severity, message);
 }
 
 void LogMessages()

@@ -1,9 +1,9 @@
 // What render threads tell a trace.
 
-#include "TraceCapture.h"
 #include "gles/CacheFiles.h"
 #include "render/ChildThreadSupport.h"
 #include "render/HWUITestSupport.h"
+#include "TraceCapture.h"
 
 #include <nib/renderer_factory.h>
 #include <nib/shader.h>
