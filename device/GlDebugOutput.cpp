@@ -128,7 +128,7 @@ public:
         ++t_groups;
     }
 
-    /// The groups of a context that a task has ended went with it.
+    /// A task that has ended its context has closed its group before.
     void EndTask() override
     {
         if (t_groups == 0)
@@ -163,7 +163,8 @@ void GlDebugOutput::Detach()
     if (!t_isOn)
         return;
     t_isOn = false;
-    t_groups = 0;
+    for (; t_groups > 0; --t_groups)
+        g_popGroup.Get()(); // those of the tasks that end the context: with it, drivers leak them
     SetAttached(false);
 }
 

@@ -227,7 +227,7 @@ TEST_F(GlDebugTest, EachTaskIsAGroupOfItsTypesName)
     EXPECT_EQ(calls[2].name, "glPopDebugGroupKHR");
 }
 
-TEST_F(GlDebugTest, WhatATaskLeavesOpenWhenItEndsTheContextIsNotClosed)
+TEST_F(GlDebugTest, TheGroupOfATaskThatEndsTheContextIsClosedBefore)
 {
     GlDebug::SetEnabled(true);
     const ThreadPtr parent = StartedParent();
@@ -236,14 +236,14 @@ TEST_F(GlDebugTest, WhatATaskLeavesOpenWhenItEndsTheContextIsNotClosed)
     child->GetMsgQueue()->waitForCompleting();
     m_driver.ForgetCalls();
     child->OnPause();
-    EXPECT_EQ(DebugCalls(m_driver), Texts({"glPushDebugGroupKHR"}));
+    EXPECT_EQ(DebugCalls(m_driver), Texts({"glPushDebugGroupKHR", "glPopDebugGroupKHR"}));
     child->OnResume();
     child->GetMsgQueue()->waitForCompleting();
     m_driver.ForgetCalls();
     child.reset();
     // The wait for the queue, then the task that ends the context.
-    EXPECT_EQ(DebugCalls(m_driver),
-              Texts({"glPushDebugGroupKHR", "glPopDebugGroupKHR", "glPushDebugGroupKHR"}));
+    EXPECT_EQ(DebugCalls(m_driver), Texts({"glPushDebugGroupKHR", "glPopDebugGroupKHR",
+                                           "glPushDebugGroupKHR", "glPopDebugGroupKHR"}));
 }
 
 // ---- where it is not ----
