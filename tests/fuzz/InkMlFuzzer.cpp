@@ -4,5 +4,5 @@
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size)
 {
-    return Nib::FuzzReader(Ink::ReadInkMl, data, size);
+    return Nib::FuzzReader(Ink::ReadInkMl, data, size, Nib::EmptyPage::Accepted);
 }
