@@ -3,6 +3,7 @@
 #include "base/Log.h"
 #include "device/GlDebugOutput.h"
 #include "render/NewTask.h"
+#include "render/RenderSteps.h"
 #include "thread/TaskScope.h"
 
 #include <nib/device.h>
@@ -290,8 +291,14 @@ void HWUIThreadGLImpl::OnPause()
 
 void HWUIThreadGLImpl::OnResume()
 {
-    Post(NewTask(m_observer, &HWUIObjectObserver::DispatchRestore));
+    Post(NewTask(this, &HWUIThreadGLImpl::RestoreObjects));
     Post(NewTask(ShaderManager::GetInstance(), &ShaderManager::OnRestoreContext));
+}
+
+void HWUIThreadGLImpl::RestoreObjects()
+{
+    NIB_FUNCTION("void Nib::GLES::HWUIThreadGLImpl::RestoreObjects()");
+    RestoreEach(*m_observer, function); // the UI's frame, too, has nobody to catch
 }
 
 // ---- what the UI does itself ----

@@ -70,6 +70,7 @@ private:
     void RunTasks(TaskQueue* queue);
     bool WaitForNextFrame(const char* function);
     void TakeSafeLock() NIB_REQUIRES(m_waitLock);
+    void RestoreObjects();
 
     // ---- the destructor's steps ----
     void RunLastTasks(const char* function);

@@ -50,13 +50,18 @@ void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, E
     context.Destroy();
 }
 
+void RestoreEach(Observer<IManagedObject>& observer, const char* function)
+{
+    observer.DispatchRestore(
+        [function](const std::exception& failure)
+        { NIB_LOG_ERROR("%s An object is not restored: %s", function, failure.what()); });
+}
+
 void RestoreObjects(Observer<IManagedObject>& observer, const char* function)
 {
     const TraceScope trace("context", "restore");
     GlDebugOutput::Attach(GlDebugOutput::Owner::RenderThread);
-    observer.DispatchRestore(
-        [function](const std::exception& failure)
-        { NIB_LOG_ERROR("%s An object is not restored: %s", function, failure.what()); });
+    RestoreEach(observer, function);
     ShaderManager::GetInstance()->OnRestoreContext();
 }
 

@@ -32,9 +32,12 @@ void DetachFromWindow(HybridSurface& surface, const char* function);
 /// the shader manager note the context that goes, stops the queue and ends @p context.
 void ReleaseContext(Observer<IManagedObject>& observer, IWorkerThread& worker, EglContext& context);
 
-/// Restores the subscribers of @p observer, first one first, and has the shader manager move its
-/// entries to the context that is now current. One that throws stays released, with a log line: the
-/// thread has nobody to catch it.
+/// Restores the subscribers of @p observer, first one first. One that throws stays released, with a
+/// log line: the thread has nobody to catch it.
+void RestoreEach(Observer<IManagedObject>& observer, const char* function);
+
+/// RestoreEach, behind which the shader manager moves its entries to the context that is now
+/// current.
 void RestoreObjects(Observer<IManagedObject>& observer, const char* function);
 
 /// How a render thread gets the context to share with: it posts a task to its parent, which alone

@@ -1,23 +1,11 @@
 #include "faults/DrawingLife.h"
 
-#include <exception>
-
 using namespace Nib;
 
 namespace
 {
 
 constexpr int kFrontSide = 30; // of the window with the front buffer
-
-class CallTask : public ITask
-{
-public:
-    explicit CallTask(std::function<void()> call) : m_call(std::move(call)) {}
-    void run() override { m_call(); }
-
-private:
-    std::function<void()> m_call;
-};
 
 } // namespace
 
@@ -31,9 +19,9 @@ void DrawingLife::Live()
     DrawFrame(0.25f, RectF{0, 0, 40, 60});
     DrawFrame(0.5f, RectF{10, 10, 20, 30});
     StartChild();
-    ExportOnChild(0.125f);
+    ExportOnThread(*m_child, m_offScreen, 0.125f);
     PauseAndResumeChild();
-    ExportOnChild(0.375f);
+    ExportOnThread(*m_child, m_offScreen, 0.375f);
     m_surface->OnSurfaceDestroyed();
     DrawFrame(0.625f, RectF{0, 0, 40, 60}); // nobody sees it
     ShowWindow(60, 40);
@@ -84,16 +72,6 @@ void DrawingLife::PauseAndResumeChild()
     OnThread(*m_child, [this] { m_offScreen.Refill(); });
 }
 
-void DrawingLife::ExportOnChild(float shade)
-{
-    OnThread(*m_child,
-             [this, shade]
-             {
-                 m_offScreen.DrawOffscreen(shade);
-                 m_offScreen.Export();
-             });
-}
-
 void DrawingLife::StartFront()
 {
     m_front.reset(RendererFactory::CreateFBRSurfaceRenderer(m_surface->GetMsgQueue(), "front"));
@@ -127,41 +105,4 @@ void DrawingLife::End()
     EndOnThread(*m_surface, m_onScreen);
     m_surface->OnSurfaceDestroyed();
     m_surface.reset();
-}
-
-void DrawingLife::OnThread(RenderThreadGL& thread, std::function<void()> work)
-{
-    PostAndWait(thread,
-                [this, work = std::move(work)]
-                {
-                    if (RendererFactory::GetContextHolder()->GetCurrentContextId())
-                        work();
-                    else
-                        Note("no context");
-                });
-}
-
-void DrawingLife::EndOnThread(RenderThreadGL& thread, DrawnThings& things)
-{
-    PostAndWait(thread, [&things] { things.Release(); }); // also where there is no context
-}
-
-void DrawingLife::PostAndWait(RenderThreadGL& thread, std::function<void()> work)
-{
-    const auto guarded = [this, work = std::move(work)]
-    {
-        try
-        {
-            work();
-        }
-        catch (const std::exception& failure)
-        {
-            Note(failure.what());
-        }
-    };
-    IGLMsgQueue* const queue = thread.GetMsgQueue();
-    if (!queue->enQueueMsg(new CallTask(guarded)))
-        Note("not queued");
-    if (!queue->waitForCompleting())
-        Note("not waited for");
 }

@@ -1,4 +1,4 @@
-#include "faults/DrawingLife.h"
+#include "faults/DrawnThings.h"
 
 using namespace Nib;
 

@@ -43,12 +43,25 @@ struct Account
     }
 };
 
-void Sweep(Fault::Kind kind, const SimGpu& gpu, const std::string& what)
+/// A life, and what it is to show when nothing goes wrong.
+struct Scene
 {
-    const LifeRecord whole = LiveOnce(gpu, {});
+    LifeKind life;
+    const char* name;
+    std::size_t pictures;
+};
+
+// four frames, two exports, two frames in a front buffer
+constexpr Scene kWindows{LifeKind::Windows, "a life", 9};
+// eight frames, two exports
+constexpr Scene kGuest{LifeKind::Guest, "a life inside a UI's frames", 10};
+
+void Sweep(Fault::Kind kind, const SimGpu& gpu, const Scene& scene)
+{
+    const LifeRecord whole = LiveOnce(gpu, {}, "", scene.life);
     ASSERT_EQ(whole.run.end, "") << whole.run.messages << whole.run.stuck;
     ASSERT_GT(whole.calls.size(), 500u);
-    ASSERT_EQ(whole.pictures.size(), 9u); // four frames, two exports, two frames in a front buffer
+    ASSERT_EQ(whole.pictures.size(), scene.pictures);
     ASSERT_EQ(whole.notes, std::vector<std::string>{});
     Account account;
     for (std::size_t n = 1; n <= whole.calls.size(); n += Stride())
@@ -56,12 +69,14 @@ void Sweep(Fault::Kind kind, const SimGpu& gpu, const std::string& what)
         const Fault fault{kind, n, whole.calls[n - 1]};
         if (kind == Fault::ContextLost && fault.name.rfind("egl", 0) != 0)
             continue;
-        const FaultVerdict verdict = Judge(whole, LiveOnce(gpu, fault), fault);
+        const FaultVerdict verdict = Judge(whole, LiveOnce(gpu, fault, "", scene.life), fault);
         account.Add(verdict);
         for (const std::string& complaint : verdict.complaints)
             ADD_FAILURE() << "call " << n << ", " << fault.name << ": " << complaint;
     }
-    account.Print(what + " (" + gpu.renderer + ")");
+    const std::string of = std::string(" of ") + scene.name + " (" + gpu.renderer + ")";
+    account.Print(kind == Fault::Refused ? "each EGL and GL call" + of + " refused once"
+                                         : "all contexts lost at each EGL call" + of);
 }
 
 SimGpu WithDamage()
@@ -79,20 +94,40 @@ SimGpu WithoutBinaries()
 
 TEST(FaultSweep, EachCallIsRefusedOnce)
 {
-    Sweep(Fault::Refused, WithDamage(), "each EGL and GL call of a life refused once");
+    Sweep(Fault::Refused, WithDamage(), kWindows);
 }
 
 TEST(FaultSweep, EachCallIsRefusedOnceWithoutProgramBinaries)
 {
-    Sweep(Fault::Refused, WithoutBinaries(), "each EGL and GL call of a life refused once");
+    Sweep(Fault::Refused, WithoutBinaries(), kWindows);
 }
 
 TEST(FaultSweep, ContextsAreLostAtEachEglCall)
 {
-    Sweep(Fault::ContextLost, WithDamage(), "all contexts lost at each EGL call of a life");
+    Sweep(Fault::ContextLost, WithDamage(), kWindows);
 }
 
 TEST(FaultSweep, ContextsAreLostAtEachEglCallWithoutProgramBinaries)
 {
-    Sweep(Fault::ContextLost, WithoutBinaries(), "all contexts lost at each EGL call of a life");
+    Sweep(Fault::ContextLost, WithoutBinaries(), kWindows);
+}
+
+TEST(FaultSweep, EachCallOfAGuestIsRefusedOnce)
+{
+    Sweep(Fault::Refused, WithDamage(), kGuest);
+}
+
+TEST(FaultSweep, EachCallOfAGuestIsRefusedOnceWithoutProgramBinaries)
+{
+    Sweep(Fault::Refused, WithoutBinaries(), kGuest);
+}
+
+TEST(FaultSweep, ContextsAreLostAtEachEglCallOfAGuest)
+{
+    Sweep(Fault::ContextLost, WithDamage(), kGuest);
+}
+
+TEST(FaultSweep, ContextsAreLostAtEachEglCallOfAGuestWithoutProgramBinaries)
+{
+    Sweep(Fault::ContextLost, WithoutBinaries(), kGuest);
 }

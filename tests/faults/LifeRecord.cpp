@@ -1,6 +1,7 @@
 #include "faults/LifeRecord.h"
 
 #include "faults/DrawingLife.h"
+#include "faults/GuestLife.h"
 #include "gles/CacheFiles.h"
 
 #include <regex>
@@ -65,7 +66,14 @@ void AddObjects(std::string& report, const SimCounts& left)
         AddLine(report, 'o', std::string(kind) + " " + std::to_string(count));
 }
 
-std::string Live(const SimGpu& gpu, const Fault& fault, const std::string& sdkFolder)
+std::unique_ptr<Life> MakeLife(LifeKind kind, SimDriver& driver)
+{
+    if (kind == LifeKind::Guest)
+        return std::make_unique<GuestLife>(driver);
+    return std::make_unique<DrawingLife>(driver);
+}
+
+std::string Live(const SimGpu& gpu, const Fault& fault, const std::string& sdkFolder, LifeKind kind)
 {
     const CacheFolder cache;
     if (!sdkFolder.empty())
@@ -76,9 +84,9 @@ std::string Live(const SimGpu& gpu, const Fault& fault, const std::string& sdkFo
     driver.NotePictures(true);
     Inject(driver, fault);
     {
-        DrawingLife life(driver);
-        life.Live();
-        for (const std::string& note : life.Notes())
+        const std::unique_ptr<Life> life = MakeLife(kind, driver);
+        life->Live();
+        for (const std::string& note : life->Notes())
             AddLine(report, 'n', note);
     }
     for (const SimCall& call : driver.Calls())
@@ -125,10 +133,11 @@ std::pair<std::string, int> ReadCount(const std::string& text)
 
 } // namespace
 
-LifeRecord LiveOnce(const SimGpu& gpu, const Fault& fault, const std::string& sdkFolder)
+LifeRecord LiveOnce(const SimGpu& gpu, const Fault& fault, const std::string& sdkFolder,
+                    LifeKind kind)
 {
     LifeRecord record;
-    record.run = RunInChild([&] { return Live(gpu, fault, sdkFolder); });
+    record.run = RunInChild([&] { return Live(gpu, fault, sdkFolder, kind); });
     std::istringstream lines(record.run.report);
     for (std::string line; std::getline(lines, line);)
     {

@@ -35,8 +35,15 @@ struct LifeRecord
     std::map<std::string, int> left;  ///< objects of the driver that are there at the end
 };
 
+enum class LifeKind
+{
+    Windows, ///< DrawingLife
+    Guest,   ///< GuestLife
+};
+
 /// Lives a life on @p gpu in a process of its own, with the toolkit's cache directory @p sdkFolder;
 /// with one of its own when that is empty.
-LifeRecord LiveOnce(const SimGpu& gpu, const Fault& fault, const std::string& sdkFolder = "");
+LifeRecord LiveOnce(const SimGpu& gpu, const Fault& fault, const std::string& sdkFolder = "",
+                    LifeKind kind = LifeKind::Windows);
 
 #endif

@@ -633,6 +633,31 @@ TEST_F(HwuiPause, ResumeRestoresInTheNextFrameWithoutWaiting)
                      "I void Nib::ShaderManager::OnRestoreContext()"}));
 }
 
+TEST_F(HwuiPause, AnObjectThatIsNotRestoredIsToldAndTheOthersAre)
+{
+    class Failing : public NotedObject
+    {
+    public:
+        using NotedObject::NotedObject;
+        void OnRestore() override { throw std::runtime_error("no memory"); }
+    } failing("failing", &notes);
+    NotedObject last("last", &notes);
+    positions.push_back(thread->GetObjectObserver()->Subscribe(&failing));
+    positions.push_back(thread->GetObjectObserver()->Subscribe(&last));
+    thread->OnPause();
+    notes.clear();
+    driver.ForgetLog();
+
+    thread->OnResume();
+    thread->Render();
+
+    EXPECT_EQ(notes, Lines({"first restore with context", "second restore with context",
+                            "last restore with context"}));
+    EXPECT_EQ(LinesWith(driver, "not restored"),
+              Lines({"E void Nib::GLES::HWUIThreadGLImpl::RestoreObjects() An object is not "
+                     "restored: no memory"}));
+}
+
 TEST_F(HwuiPause, ReachesTheObjectsOfAllHwuiThreads)
 {
     GLES::HWUIThreadGLImpl other(&callback, "other");
