@@ -11,35 +11,53 @@ namespace Nib
 class Spin
 {
 public:
+    using Duration = std::chrono::steady_clock::duration;
+
+    /// What a thread that waits takes from others at most.
+    static constexpr Duration kLimit = std::chrono::microseconds(20);
+
     /// Spins as long as @p isWaiting() says so, and no longer than the limit. False at the limit.
     template <typename Condition>
     static bool While(Condition isWaiting)
+    {
+        Duration left = kLimit;
+        return While(isWaiting, left);
+    }
+
+    /// The same with what is @p left of a limit, which becomes less by the time that this took.
+    template <typename Condition>
+    static bool While(Condition isWaiting, Duration& left)
     {
         for (int turn = 0; turn < kTurnsWithoutClock; ++turn)
         {
             if (!isWaiting())
                 return true;
+            left -= kTurn;
             Relax();
         }
-        const Clock::time_point end = Clock::now() + kLimit - kWithoutClock;
+        Clock::time_point now = Clock::now();
+        const Clock::time_point end = now + left;
         do
         {
             for (int turn = 0; turn < kTurnsBetweenLooks; ++turn)
             {
                 if (!isWaiting())
+                {
+                    left = end - now; // to look again would hold up who was waited for
                     return true;
+                }
                 Relax();
             }
-        } while (Clock::now() < end);
+            now = Clock::now();
+        } while (now < end);
+        left = Duration::zero();
         return false;
     }
 
 private:
     using Clock = std::chrono::steady_clock;
 
-    static constexpr std::chrono::microseconds kLimit{20};
-    // What the turns before the first look at the clock take at most, at 100 ns each.
-    static constexpr std::chrono::microseconds kWithoutClock{3};
+    static constexpr Duration kTurn = std::chrono::nanoseconds(100); // at most
     static constexpr int kTurnsWithoutClock = 30;
     static constexpr int kTurnsBetweenLooks = 8;
 

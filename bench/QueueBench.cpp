@@ -141,19 +141,82 @@ void BM_Post(benchmark::State& state)
         executor.reset();
 }
 
-#define NIB_POSTS(executor)                                                                        \
-    BENCHMARK_TEMPLATE(BM_Post, executor)                                                          \
-        ->Iterations(1 << 17)                                                                      \
-        ->Threads(1)                                                                               \
-        ->Threads(2)                                                                               \
-        ->Threads(4)                                                                               \
-        ->Threads(8)
+#define NIB_POSTS(executor) BENCHMARK_TEMPLATE(BM_Post, executor)->Iterations(1 << 17)
 NIB_POSTS(NibExecutor);
 NIB_POSTS(LockedDequeExecutor);
 NIB_POSTS(MoodycamelExecutor);
 NIB_POSTS(AsioExecutor);
 NIB_POSTS(TbbExecutor);
 NIB_POSTS(UvExecutor);
+
+// ---- posts of several threads to one worker -----------------------------------------------------
+
+/// Lets go of some threads at once.
+class StartLine
+{
+public:
+    /// Called by each thread.
+    void Wait() const
+    {
+        while (!m_open.load(std::memory_order_acquire))
+            sched_yield();
+    }
+    void Open() { m_open.store(true, std::memory_order_release); }
+
+private:
+    std::atomic<bool> m_open{false};
+};
+
+/// Argument: the number of producers. The time goes from the start of the first producer to the end
+/// of the last; the counter "run" says how many tasks a second were also run, from the start until
+/// the last one had run.
+template <typename Executor>
+void BM_Producers(benchmark::State& state)
+{
+    constexpr int kTasks = 1 << 17; // of each producer
+    const int producers = static_cast<int>(state.range(0));
+    std::int64_t tasks = 0;
+    double timeToRun = 0;
+    for (auto _ : state)
+    {
+        auto executor = std::make_unique<Executor>(1);
+        StartLine line;
+        std::vector<std::thread> threads;
+        for (int number = 0; number < producers; ++number)
+            threads.emplace_back(
+                [&]
+                {
+                    line.Wait();
+                    for (int task = 0; task < kTasks; ++task)
+                        executor->Post(Stroke());
+                });
+        const Clock::time_point begin = Clock::now();
+        line.Open();
+        for (std::thread& thread : threads)
+            thread.join();
+        state.SetIterationTime(Nanoseconds(Clock::now() - begin) / 1e9);
+        executor.reset(); // all have run
+        timeToRun += Nanoseconds(Clock::now() - begin) / 1e9;
+        tasks += std::int64_t{producers} * kTasks;
+    }
+    state.SetItemsProcessed(tasks);
+    state.counters["run"] = static_cast<double>(tasks) / timeToRun;
+}
+
+#define NIB_PRODUCERS(executor)                                                                    \
+    BENCHMARK_TEMPLATE(BM_Producers, executor)                                                     \
+        ->Arg(1)                                                                                   \
+        ->Arg(2)                                                                                   \
+        ->Arg(4)                                                                                   \
+        ->Arg(8)                                                                                   \
+        ->Iterations(3)                                                                            \
+        ->UseManualTime()
+NIB_PRODUCERS(NibExecutor);
+NIB_PRODUCERS(LockedDequeExecutor);
+NIB_PRODUCERS(MoodycamelExecutor);
+NIB_PRODUCERS(AsioExecutor);
+NIB_PRODUCERS(TbbExecutor);
+NIB_PRODUCERS(UvExecutor);
 
 // ---- the wake of a sleeping thread --------------------------------------------------------------
 

@@ -29,10 +29,10 @@ void* ITask::operator new(std::size_t size, const std::nothrow_t&) noexcept
     }
 }
 
-// After a constructor that threw; without the size, the block goes back to the heap.
+// After a constructor that threw.
 void ITask::operator delete(void* memory, const std::nothrow_t&) noexcept
 {
-    ::operator delete(memory);
+    TaskMemory::FreeUnsized(memory);
 }
 
 bool ITask::isGlobalLockAllowed()

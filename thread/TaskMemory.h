@@ -2,6 +2,7 @@
 #define NIB_THREAD_TASK_MEMORY_H
 
 #include <cstddef>
+#include <cstdint>
 
 #if defined(__SANITIZE_ADDRESS__)
 #define NIB_ADDRESS_SANITIZER 1
@@ -14,12 +15,17 @@
 namespace Nib
 {
 
-/// Memory for tasks, which are made on one thread and deleted on another all day long. Each thread
-/// keeps the blocks that it freed, by size; what becomes too much goes in batches to a depot, from
-/// which threads that have none take them. So in the long run no task costs an allocation.
+/// Memory for tasks, which are made on one thread and deleted on another all day long.
 ///
-/// Blocks are allocated one by one and given back when the depot is full. Large tasks go past it,
-/// and under an address sanitizer all do, so that it sees their misuse.
+/// It is cut from slabs. A thread cuts the blocks of one size from a slab of its own, one behind the
+/// other, so that tasks lie in the order in which they were made, which is the order in which they
+/// are read; a thread that frees only counts. A slab of which every block is free goes to the depot,
+/// from which all threads take. So in the long run no task costs an allocation, and a thread meets
+/// others once in a slab, not once in a task.
+///
+/// A block is not used again before its whole slab is free: tasks that are kept for long keep theirs.
+/// Large tasks come from the heap, and under an address sanitizer all do, so that it sees their
+/// misuse.
 class TaskMemory
 {
 public:
@@ -29,56 +35,61 @@ public:
         const std::size_t index = ClassOf(size);
         if (index >= kClasses)
             return AllocateLarge(size);
-        Shelf& shelf = t_shelves[index];
-        if (shelf.first == nullptr)
-            return Refill(index);
-        Block* const block = shelf.first;
-        shelf.first = block->next;
-        --shelf.count;
+        Supply& supply = t_supplies[index];
+        if (supply.left == 0)
+            Refill(index);
+        --supply.left;
+        std::byte* const block = supply.next;
+        supply.next = block + SizeOf(index);
         return block;
     }
 
     /// Any thread, also another one than that which allocated; @p size as then.
     static void Free(void* memory, std::size_t size) noexcept
     {
-        const std::size_t index = ClassOf(size);
-        if (index >= kClasses)
+        if (ClassOf(size) >= kClasses)
             return FreeLarge(memory);
-        Shelf& shelf = t_shelves[index];
-        if (shelf.count >= kMostOnShelf)
-            return Spill(index, memory);
-        Block* const block = static_cast<Block*>(memory);
-        block->next = shelf.first;
-        shelf.first = block;
-        ++shelf.count;
+        Slab* const slab = SlabOf(memory);
+        Returns& returns = ReturnsOf(slab);
+        if (returns.slab != slab)
+            return FreeElsewhere(slab);
+        ++returns.count;
     }
+
+    /// The same where the size is not known. Slow.
+    static void FreeUnsized(void* memory) noexcept;
 
 private:
     class Depot;
+    class Slab;
     struct EndOfThread;
 
-    struct Block
+    static constexpr std::size_t kStep = 64; // from one size to the next: lines are not shared
+    static constexpr std::size_t kClasses = 4;
+    static constexpr std::size_t kSlabAlignment = 8192;
+    static constexpr std::size_t kMostInDepot = std::size_t{8} << 20; // bytes
+    static constexpr std::size_t kReturns = 4;
+
+    /// What a thread has not cut yet of its slab of one size.
+    struct Supply
     {
-        Block* next;
-        Block* nextBatch; ///< of the first block of a batch that lies in the depot
+        std::byte* next = nullptr;
+        std::size_t left = 0;
     };
 
-    static constexpr std::size_t kStep = 32; // bytes from one size to the next
-    static constexpr std::size_t kClasses = 8;
-    static constexpr int kBatch = 32;
-    static constexpr int kMostOnShelf = 2 * kBatch;
-    // Counts of shelves that are not in use; larger than all others.
-    static constexpr int kUntouched = kMostOnShelf + 1;
-    static constexpr int kThreadEnded = kMostOnShelf + 2;
-    static constexpr std::size_t kMostInDepot = std::size_t{8} << 20; // bytes of each size
-
-    static_assert(sizeof(Block) <= kStep);
-
-    /// A thread's own blocks of one size.
-    struct Shelf
+    /// How many blocks of a slab a thread has freed without telling the slab. One of another slab
+    /// that has to be noted in the same place tells it.
+    struct Returns
     {
-        Block* first = nullptr;
-        int count = kUntouched;
+        Slab* slab = nullptr;
+        int count = 0;
+    };
+
+    enum class Use
+    {
+        Untouched,
+        Open,
+        ThreadEnded,
     };
 
 #if defined(NIB_ADDRESS_SANITIZER)
@@ -96,18 +107,27 @@ private:
     {
         return (index + 1) * kStep;
     }
+    static Slab* SlabOf(void* memory)
+    {
+        const auto inSlab = reinterpret_cast<std::uintptr_t>(memory) % kSlabAlignment;
+        return reinterpret_cast<Slab*>(static_cast<std::byte*>(memory) - inSlab);
+    }
+    static Returns& ReturnsOf(const Slab* slab)
+    {
+        return t_returns[reinterpret_cast<std::uintptr_t>(slab) / kSlabAlignment % kReturns];
+    }
 
     static void* AllocateLarge(std::size_t size);
     static void FreeLarge(void* memory) noexcept;
-    static void* Refill(std::size_t index);
-    static void Spill(std::size_t index, void* memory) noexcept;
-    static void Touch(Shelf& shelf);
-    static void GiveBatch(Shelf& shelf, std::size_t index) noexcept;
-    static void FreeBlocks(Block* block) noexcept;
+    static void Refill(std::size_t index);
+    static void FreeElsewhere(Slab* slab) noexcept;
+    static bool IsOpen();
 
     // Initialised at build time and without destructor: nothing to check at each use. EndOfThread
     // empties them.
-    static thread_local Shelf t_shelves[kClasses];
+    static thread_local Supply t_supplies[kClasses];
+    static thread_local Returns t_returns[kReturns];
+    static thread_local Use t_use;
 };
 
 } // namespace Nib

@@ -2,7 +2,6 @@
 
 #include "base/HandOver.h"
 #include "base/Log.h"
-#include "base/Spin.h"
 #include "thread/GlobalLocker.h"
 #include "thread/TaskScope.h"
 
@@ -293,18 +292,19 @@ void WorkerThreadImpl::SleepUntilNeeded()
         m_wakeCondition.Wait(&m_wakeLock, kNoTimeout);
 }
 
-// Behind a synchronous call: who waited for it comes again soon. Who only posts does not wait, and
-// to spin for the next task would take the processor from others.
-bool WorkerThreadImpl::ExpectsCall()
+// Behind a synchronous call: who waited for it comes again soon, with tasks perhaps before the next
+// call. Who only posts does not wait, and to spin for the next task would take the processor from
+// others: one call allows for one limit in all.
+bool WorkerThreadImpl::ExpectsCall() const
 {
-    return std::exchange(m_hasAnswered, false) && !IsPaused() && m_partners.WorkerMaySpin();
+    return m_spinLeft > Spin::Duration::zero() && !IsPaused() && m_partners.WorkerMaySpin();
 }
 
 bool WorkerThreadImpl::SpinForWork()
 {
     const auto isIdle = [this]
     { return !IsPaused() && m_pending.load(std::memory_order_acquire) < 1; };
-    const bool found = Spin::While(isIdle);
+    const bool found = Spin::While(isIdle, m_spinLeft);
     if (!found)
         m_partners.WorkerSpunInVain();
     return found;
@@ -341,7 +341,7 @@ bool WorkerThreadImpl::RunSynchronously(std::atomic<ITask*>& task, bool deleteAf
     if (deleteAfterRun)
         delete run;
     task.store(nullptr, std::memory_order_release);
-    m_hasAnswered = true;
+    m_spinLeft = Spin::kLimit;
     answersWithoutLock.emplace();
     m_doneCondition.Signal();
     return true;

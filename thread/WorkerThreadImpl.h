@@ -1,6 +1,7 @@
 #ifndef NIB_THREAD_WORKER_THREAD_IMPL_H
 #define NIB_THREAD_WORKER_THREAD_IMPL_H
 
+#include "base/Spin.h"
 #include "base/ThreadAnnotations.h"
 #include "thread/SpinPartners.h"
 #include "thread/TaskQueue.h"
@@ -51,7 +52,7 @@ private:
     void HandOverAndWait(ITask* task, bool aheadOfQueue, bool deleteAfterRun);
     void RunTurn();
     void SleepUntilNeeded();
-    bool ExpectsCall();
+    bool ExpectsCall() const;
     bool SpinForWork();
     void RunDirectTask();
     void RunOneAsyncTask();
@@ -94,7 +95,7 @@ private:
     // that its producer has linked but not yet counted.
     alignas(kCacheLine) std::atomic<std::int32_t> m_pending{0};
     alignas(kCacheLine) TaskQueue m_queue;
-    bool m_hasAnswered = false; // a synchronous call, since the worker was last idle
+    Spin::Duration m_spinLeft{}; // of what the latest synchronous call allows
 };
 
 } // namespace Nib

@@ -63,6 +63,6 @@ TEST(CallCost, ItsCarriersAreUsedAgain)
     worker->Start(!kPaused);
     const long before = AllocationsOfAllThreads();
     Call(*worker, 5000);
-    // What lies on the worker's shelf and on the way back: 64 and 32 carriers.
-    EXPECT_LE(AllocationsOfAllThreads() - before, 100);
+    // The slab that carriers are cut from, and those that are on their way back.
+    EXPECT_LE(AllocationsOfAllThreads() - before, 8);
 }

@@ -2,10 +2,12 @@
 
 #include "base/HandOver.h"
 
+#include <cerrno>
 #include <cstdlib>
 #include <new>
 
 #include <dlfcn.h>
+#include <malloc.h>
 
 // ---- counted signals: this definition goes before the base library's, and calls it --------------
 
@@ -80,31 +82,39 @@ namespace
 
 thread_local long t_allocations = 0;
 std::atomic<long> g_allocations{0};
-std::atomic<long> g_frees{0};
+
+void CountAllocation()
+{
+    ++t_allocations;
+    g_allocations.fetch_add(1, std::memory_order_relaxed);
+}
 
 } // namespace
 
 void* operator new(std::size_t size)
 {
-    ++t_allocations;
+    CountAllocation();
     if (void* memory = std::malloc(size != 0 ? size : 1))
-    {
-        g_allocations.fetch_add(1, std::memory_order_relaxed);
         return memory;
-    }
     throw std::bad_alloc();
 }
 
 void operator delete(void* memory) noexcept
 {
-    if (memory)
-        g_frees.fetch_add(1, std::memory_order_relaxed);
     std::free(memory);
 }
 
 void operator delete(void* memory, std::size_t) noexcept
 {
     operator delete(memory);
+}
+
+// Also goes before the C library's.
+extern "C" int posix_memalign(void** memory, std::size_t alignment, std::size_t size) noexcept
+{
+    CountAllocation();
+    *memory = memalign(alignment, size);
+    return *memory ? 0 : ENOMEM;
 }
 
 long AllocationsSoFar()
@@ -117,7 +127,8 @@ long AllocationsOfAllThreads()
     return g_allocations.load();
 }
 
-long LiveAllocations()
+std::size_t MemoryInUse()
 {
-    return g_allocations.load() - g_frees.load();
+    const struct mallinfo2 heap = mallinfo2();
+    return heap.uordblks + heap.hblkhd;
 }

@@ -177,7 +177,8 @@ long AllocationsSoFar();
 /// How often any thread has.
 long AllocationsOfAllThreads();
 
-/// How many of these were not freed.
-long LiveAllocations();
+/// Bytes that the main thread has allocated and nobody has freed. Not under a sanitizer, which has a
+/// heap of its own.
+std::size_t MemoryInUse();
 
 #endif
