@@ -161,6 +161,27 @@ TEST(TaskMemory, AConstructorThatThrowsCostsNoMemoryInTheLongRun)
     EXPECT_EQ(AllocationsOfAllThreads() - before, 0);
 }
 
+TEST(TaskMemory, SaysWhenThereIsNoMemoryAndServesAgainLater)
+{
+    if (kUnderAddressSanitizer)
+        GTEST_SKIP() << "under an address sanitizer every task is allocated";
+    std::vector<std::unique_ptr<ITask>> tasks;
+    tasks.reserve(1000);
+    const auto makeMany = [&tasks]
+    {
+        while (tasks.size() < 1000)
+            tasks.emplace_back(new SmallTask);
+    };
+    RefuseAlignedMemory(true);
+    EXPECT_THROW(makeMany(), std::bad_alloc);
+    EXPECT_EQ(new (std::nothrow) SmallTask, nullptr);
+    EXPECT_LT(tasks.size(), 1000u);
+    RefuseAlignedMemory(false);
+    makeMany();
+    for (const std::unique_ptr<ITask>& task : tasks)
+        task->run();
+}
+
 // ---- across threads -----------------------------------------------------------------------------
 
 namespace

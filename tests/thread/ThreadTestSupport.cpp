@@ -82,6 +82,7 @@ namespace
 
 thread_local long t_allocations = 0;
 std::atomic<long> g_allocations{0};
+std::atomic<bool> g_refusesAligned{false};
 
 void CountAllocation()
 {
@@ -113,8 +114,15 @@ void operator delete(void* memory, std::size_t) noexcept
 extern "C" int posix_memalign(void** memory, std::size_t alignment, std::size_t size) noexcept
 {
     CountAllocation();
+    if (g_refusesAligned)
+        return ENOMEM;
     *memory = memalign(alignment, size);
     return *memory ? 0 : ENOMEM;
+}
+
+void RefuseAlignedMemory(bool refuse)
+{
+    g_refusesAligned = refuse;
 }
 
 long AllocationsSoFar()

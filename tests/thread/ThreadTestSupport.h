@@ -171,6 +171,9 @@ void WaitForWaits(int before, int more);
 /// How many waits of synchronous callers have asked for a spin.
 int SpinsSoFar();
 
+/// Whether posix_memalign fails, on all threads.
+void RefuseAlignedMemory(bool refuse);
+
 /// How often the calling thread has allocated since the start of the process.
 long AllocationsSoFar();
 
