@@ -60,8 +60,15 @@ void BM_LoadEmpty(benchmark::State& state)
     Load(state, NIB_EMPTY_LIBRARY);
 }
 
+// A library that needs another one, both empty.
+void BM_LoadEmptyPair(benchmark::State& state)
+{
+    Load(state, NIB_EMPTY_PAIR);
+}
+
 BENCHMARK(BM_Load)->UseManualTime()->Iterations(200);
 BENCHMARK(BM_LoadEmpty)->UseManualTime()->Iterations(200);
+BENCHMARK(BM_LoadEmptyPair)->UseManualTime()->Iterations(200);
 
 } // namespace
 

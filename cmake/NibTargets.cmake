@@ -14,16 +14,21 @@ endfunction()
 # link it with a simulated EGL and GL in place of the real ones.
 function(nib_add_renderer)
     nib_sources(sources ${ARGN})
+    nib_sources(arithmetic math)
+    nib_optimize_fully(${arithmetic} thread/TaskMemory.cpp thread/WorkerThreadImpl.cpp
+        gles/Crc32.cpp gles/GraphicsObject.cpp gles/ParameterBindingImpl.cpp)
     add_library(NibRendererObjects OBJECT ${sources})
     target_include_directories(NibRendererObjects PUBLIC
         ${CMAKE_CURRENT_SOURCE_DIR} ${CMAKE_CURRENT_SOURCE_DIR}/include)
     target_compile_definitions(NibRendererObjects PRIVATE NIB_BUILDING_RENDERER)
-    target_link_libraries(NibRendererObjects PUBLIC NibBase ZLIB::ZLIB PRIVATE NibBuildFlags)
+    target_link_libraries(NibRendererObjects PUBLIC NibBase ZLIB::ZLIB PRIVATE NibBuildFlags NibShippedCode)
 
     add_library(NibRenderer SHARED)
     add_library(NibRenderer::NibRenderer ALIAS NibRenderer)
     target_link_libraries(NibRenderer
         PRIVATE NibRendererObjects NibBuildFlags ZLIB::ZLIB ${NIB_GL_LIBRARIES} PUBLIC NibBase)
+    nib_link_shipped(NibRenderer)
+    nib_bind_own_functions(NibRenderer)
     target_include_directories(NibRenderer PUBLIC
         $<BUILD_INTERFACE:${CMAKE_CURRENT_SOURCE_DIR}/include>
         $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)

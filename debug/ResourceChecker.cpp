@@ -9,7 +9,7 @@
 #include <EGL/egl.h>
 
 #include <cstdint>
-#include <iostream>
+#include <cstdio>
 #include <stdexcept>
 #include <utility>
 
@@ -64,6 +64,18 @@ GLenum LabelledKind(ResourceChecker::DescriptorType type)
     }
     return 0;
 }
+
+/// A pointer as a stream writes it: 0 where it is null.
+struct PointerText
+{
+    explicit PointerText(const void* pointer)
+    {
+        if (pointer)
+            std::snprintf(text, sizeof text, "%p", pointer);
+    }
+
+    char text[2 + 2 * sizeof(void*) + 1] = "0";
+};
 
 const char* QueueName(IGLMsgQueue* queue)
 {
@@ -296,10 +308,11 @@ void ResourceChecker::printResource(const std::set<CheckerItem>& resources)
     if (!System::IsBuildTypeEngMode())
         return;
     AutoCriticalSection lock(cs, __func__, __LINE__);
+    // Not by std::cout, for which every program that loads the library would set up all streams.
     for (const CheckerItem& item : resources)
-        std::cout << "context=" << item.context << ", queue=" << item.queue << ", id=" << item.id
-                  << '\n';
-    std::cout.flush();
+        std::printf("context=%s, queue=%s, id=%u\n", PointerText(item.context).text,
+                    PointerText(item.queue).text, item.id);
+    std::fflush(stdout);
 }
 
 } // namespace Nib

@@ -7,6 +7,7 @@
 #include <limits>
 
 #if defined(__x86_64__)
+#include <cpuid.h>
 #include <immintrin.h>
 #endif
 
@@ -201,9 +202,19 @@ NIB_CARRYLESS std::uint64_t ContinueByFolding(std::uint64_t crc, const unsigned 
 
 #undef NIB_CARRYLESS
 
+// Asked at the first use. The compiler's own list of what a processor can do asks at load and for
+// everything, and a virtual machine makes 5 us of every question.
+bool HasCarryLessMultiplication()
+{
+    unsigned a, b, c, d;
+    __cpuid(1, a, b, c, d);
+    return (c & bit_PCLMUL) != 0;
+}
+
 bool CanFold(std::size_t size)
 {
-    return size >= kLane && __builtin_cpu_supports("pclmul") != 0;
+    static const bool can = HasCarryLessMultiplication();
+    return size >= kLane && can;
 }
 
 #else

@@ -36,7 +36,7 @@ namespace
 extern "C" NIB_EXPORT int __android_log_print(int priority, const char* tag, const char* format,
                                               ...)
 {
-    if (Nib::IsDropped(priority))
+    if (Nib::IsDropped(priority)) [[likely]]
         return -EPERM;
     std::va_list arguments;
     va_start(arguments, format);

@@ -25,8 +25,6 @@ foreach(symbol IN LISTS used)
        AND NOT symbol MATCHES "^__(errno_location|libc_single_threaded|tls_get_addr|dso_handle)$"
        # Inlined from the condition variable of this machine's C++ library; Android's does without.
        AND NOT symbol STREQUAL "pthread_cond_clockwait"
-       # What the processor of this machine can do, which is asked of those of its kind alone.
-       AND NOT symbol STREQUAL "__cpu_model"
        AND NOT symbol MATCHES "^__stack_chk_fail$|^_GLOBAL_OFFSET_TABLE_$")
         list(APPEND unknown ${symbol})
     endif()

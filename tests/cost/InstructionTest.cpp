@@ -104,4 +104,9 @@ TEST_F(Cost, OfEachHotPathIsFewInstructions)
     EXPECT_LE(Own("TiledPresent"), 750);
     EXPECT_LE(Own("Program"), 1900);
     EXPECT_LE(Of("Filtered"), 40);
+    EXPECT_LE(Of("Product3"), kIsRelease ? 70 : 76);
+    EXPECT_LE(Of("Product4"), kIsRelease ? 92 : 99);
+    EXPECT_LE(Of("Inverse3"), kIsRelease ? 102 : 137);
+    EXPECT_LE(Of("Inverse4"), kIsRelease ? 236 : 371);
+    EXPECT_LE(Of("MapRect"), kIsRelease ? 70 : 85);
 }

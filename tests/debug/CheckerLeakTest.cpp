@@ -121,6 +121,17 @@ TEST_F(ResourceCheckerTest, PrintResourceWritesALineAnItem)
     EXPECT_EQ(testing::internal::GetCapturedStdout(), expected);
 }
 
+TEST_F(ResourceCheckerTest, PrintResourceWritesANullPointerAsZero)
+{
+    ResourceChecker::Database items;
+    items.insert(Item(7u, nullptr, nullptr));
+
+    testing::internal::CaptureStdout();
+    ResourceChecker::printResource(items);
+
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "context=0, queue=0, id=7\n");
+}
+
 // ---- several threads ----------------------------------------------------------------------------
 
 TEST_F(ResourceCheckerTest, TwoThreadsUseItAtOnce)

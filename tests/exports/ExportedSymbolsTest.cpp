@@ -1,36 +1,15 @@
+#include "OutputOf.h"
+
 #include <gtest/gtest.h>
 
 #include <array>
-#include <cstdio>
-#include <memory>
 #include <set>
 #include <string>
-#include <vector>
 
 // What the built libraries define, as `nm` names it.
 
 namespace
 {
-
-std::vector<std::string> OutputOf(const std::string& command)
-{
-    const std::unique_ptr<FILE, int (*)(FILE*)> pipe(popen(command.c_str(), "r"), pclose);
-    std::vector<std::string> lines;
-    if (!pipe)
-        return lines;
-    std::string line;
-    for (int c = std::fgetc(pipe.get()); c != EOF; c = std::fgetc(pipe.get()))
-    {
-        if (c != '\n')
-        {
-            line += static_cast<char>(c);
-            continue;
-        }
-        lines.push_back(line);
-        line.clear();
-    }
-    return lines;
-}
 
 /// The names that @p file defines for others, demangled.
 std::set<std::string> DefinedBy(const char* file)

@@ -92,6 +92,11 @@ void TiledPresent(HotScene& scene, int times); ///< the same in tiles
 void GlProgram(HotScene& scene, int times);
 void Program(HotScene& scene, int times);  ///< made from a binary in memory, and released
 void Filtered(HotScene& scene, int times); ///< a log line that nobody wants to see
+void Product3(HotScene&, int times);       ///< of matrices of 3x3, into a new one
+void Product4(HotScene&, int times);
+void Inverse3(HotScene&, int times);
+void Inverse4(HotScene&, int times);
+void MapRect(HotScene&, int times); ///< the box of a rectangle mapped by a matrix of 3x3
 
 } // namespace HotPaths
 
@@ -105,6 +110,11 @@ inline constexpr HotPath kHotPaths[] = {
     {"TiledPresent", &HotPaths::GlTiledPresent, &HotPaths::TiledPresent},
     {"Program", &HotPaths::GlProgram, &HotPaths::Program},
     {"Filtered", nullptr, &HotPaths::Filtered},
+    {"Product3", nullptr, &HotPaths::Product3},
+    {"Product4", nullptr, &HotPaths::Product4},
+    {"Inverse3", nullptr, &HotPaths::Inverse3},
+    {"Inverse4", nullptr, &HotPaths::Inverse4},
+    {"MapRect", nullptr, &HotPaths::MapRect},
 };
 
 #endif
