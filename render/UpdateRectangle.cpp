@@ -300,6 +300,7 @@ void UpdateRectangle::Reset()
 
 bool UpdateRectangle::DoSwapBuffers()
 {
+    NIB_FUNCTION("bool Nib::UpdateRectangle::DoSwapBuffers()");
     const bool isPart = (m_mode & kPostSubBuffer) != 0 || NeedsDamageRect();
     const DamageRect part = isPart ? m_damageRect : DamageRect{0, 0, m_screenWidth, m_screenHeight};
     const TraceScope trace("frame", "swap",
@@ -308,14 +309,16 @@ bool UpdateRectangle::DoSwapBuffers()
                             {"y", part.y},
                             {"width", part.width},
                             {"height", part.height}});
-    if ((m_mode & kPostSubBuffer) != 0)
-    {
-        return m_postSubBuffer(Display(), m_surface->Get(), m_damageRect.x, m_damageRect.y,
-                               m_damageRect.width, m_damageRect.height) == EGL_TRUE;
-    }
-    if (NeedsDamageRect())
-        return m_swapBuffersWithDamage(Display(), m_surface->Get(), &m_damageRect.x, 1) == EGL_TRUE;
-    return m_surface->SwapBuffers();
+    if (!isPart)
+        return m_surface->SwapBuffers();
+    const EGLBoolean isShown =
+        (m_mode & kPostSubBuffer) != 0
+            ? m_postSubBuffer(Display(), m_surface->Get(), part.x, part.y, part.width, part.height)
+            : m_swapBuffersWithDamage(Display(), m_surface->Get(), &m_damageRect.x, 1);
+    // The render thread has nobody to return false to. Why it was refused is EGL's to tell, once.
+    if (isShown != EGL_TRUE)
+        NIB_LOG_ERROR("%s The frame is not shown", function);
+    return isShown == EGL_TRUE;
 }
 
 // ---- what it has come to ------------------------------------------------------------------------

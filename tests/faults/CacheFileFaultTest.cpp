@@ -188,7 +188,7 @@ protected:
             }
         }
         std::cout << "RELIABILITY | each file operation of the program cache gone wrong, " << what
-                  << " | " << m_runs << " | " << m_lost << "\n";
+                  << StrideText() << " | " << m_runs << " | " << m_lost << "\n";
     }
 
     static void WithGoodFiles(const std::string& folder) { BuildOnce(folder, Driver()); }

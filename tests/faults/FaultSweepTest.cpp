@@ -75,8 +75,9 @@ void Sweep(Fault::Kind kind, const SimGpu& gpu, const Scene& scene)
             ADD_FAILURE() << "call " << n << ", " << fault.name << ": " << complaint;
     }
     const std::string of = std::string(" of ") + scene.name + " (" + gpu.renderer + ")";
-    account.Print(kind == Fault::Refused ? "each EGL and GL call" + of + " refused once"
-                                         : "all contexts lost at each EGL call" + of);
+    account.Print(kind == Fault::Refused
+                      ? "each EGL and GL call" + of + " refused once" + StrideText()
+                      : "all contexts lost at each EGL call" + of + StrideText());
 }
 
 SimGpu WithDamage()

@@ -30,9 +30,7 @@ const Names& ToldByGlAlone()
         "glClear", "glClearColor", "glDrawArraysInstanced", "glDrawElements", "glReadPixels",
         "glTexSubImage2D",
         // The end of a frame in the front buffer: it is shown when the driver likes.
-        "glFinish",
-        // The end of a frame: the result of the call is DoSwapBuffers's, the reason EGL's to tell.
-        "eglSwapBuffersWithDamageKHR"};
+        "glFinish"};
     return *names;
 }
 

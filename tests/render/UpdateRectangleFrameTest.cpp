@@ -413,6 +413,9 @@ TEST(UpdateRectangleFrame, RefusedSubBufferIsFalse)
 
     EXPECT_EQ(window.driver.CallCount("eglSwapBuffers"), 0u);
     EXPECT_EQ(window.driver.CallCount("eglGetError"), 0u) << "the caller may ask for it";
+    EXPECT_EQ(window.driver.CountLogContaining(
+                  "bool Nib::UpdateRectangle::DoSwapBuffers() The frame is not shown"),
+              1u);
 }
 
 TEST(UpdateRectangleFrame, DamageModeSwapsWithTheDamage)
@@ -453,6 +456,9 @@ TEST(UpdateRectangleFrame, RefusedDamageSwapIsFalse)
 
     EXPECT_EQ(window.driver.CallCount("eglSwapBuffers"), 0u);
     EXPECT_EQ(window.driver.CallCount("eglGetError"), 0u) << "the caller may ask for it";
+    EXPECT_EQ(window.driver.CountLogContaining(
+                  "bool Nib::UpdateRectangle::DoSwapBuffers() The frame is not shown"),
+              1u);
 }
 
 TEST(UpdateRectangleFrame, DamageModeWithoutTheDamageSwapSwapsAll)
