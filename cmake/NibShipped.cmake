@@ -22,10 +22,11 @@ if(NIB_SANITIZE OR NIB_FUZZ_COVERAGE OR CMAKE_CXX_FLAGS MATCHES "coverage|saniti
     set(NIB_EXPORTS_ALL ON)
 endif()
 
-# Only what is ours is exported.
+# Only what is ours is exported. A library stays once it is loaded: its threads run on, and threads of
+# the program end in its code.
 function(nib_link_shipped library)
     target_link_libraries(${library} PRIVATE NibShippedCode)
-    target_link_options(${library} PRIVATE -Wl,--gc-sections)
+    target_link_options(${library} PRIVATE -Wl,--gc-sections -Wl,-z,nodelete)
     if(NOT NIB_EXPORTS_ALL)
         set(exports ${PROJECT_SOURCE_DIR}/cmake/exports.map)
         target_link_options(${library} PRIVATE -Wl,--version-script=${exports})

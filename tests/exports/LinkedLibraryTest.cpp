@@ -130,6 +130,17 @@ TEST_F(LinkedLibrary, ExportsNothingOfTheStandardLibrary)
     }
 }
 
+TEST_F(LinkedLibrary, StaysOnceItIsLoaded)
+{
+    for (const char* file : {NIB_RENDERER_FILE, NIB_BASE_FILE})
+    {
+        bool stays = false;
+        for (const std::string& line : OutputOf(std::string(NIB_READELF) + " -dW '" + file + "'"))
+            stays = stays || line.find("NODELETE") != std::string::npos;
+        EXPECT_TRUE(stays) << file;
+    }
+}
+
 #ifdef NDEBUG
 constexpr std::uintmax_t kLargest = 409600;
 #else
