@@ -5,7 +5,7 @@
 add_library(NibShippedCode INTERFACE)
 target_compile_options(NibShippedCode INTERFACE
     # A tenth smaller than -O3; docs/performance.md has what that costs and what it does not.
-    $<$<CONFIG:Release>:-O2>
+    $<$<CONFIG:Release>:-O2 -fno-plt>
     # Sections of their own, so that the linker leaves out what nothing uses.
     $<$<NOT:$<CONFIG:Debug>>:-ffunction-sections -fdata-sections>
     # Exported functions may be put into each other, as Clang does anyway.
