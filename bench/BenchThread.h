@@ -1,6 +1,8 @@
 #ifndef NIB_BENCH_BENCHTHREAD_H
 #define NIB_BENCH_BENCHTHREAD_H
 
+#include "../tests/Owned.h"
+
 #include <nib/base.h>
 #include <nib/msg_queue.h>
 #include <nib/render_thread.h>
@@ -17,19 +19,6 @@
 #include <string>
 
 #include <malloc.h>
-
-/// Ends objects of the renderer factory.
-struct FactoryRelease
-{
-    template <typename T>
-    void operator()(T* object) const
-    {
-        object->Release();
-    }
-};
-
-template <typename T>
-using Owned = std::unique_ptr<T, FactoryRelease>;
 
 /// What every benchmark program runs in: a cache folder of its own, which goes with this object, no
 /// log output, and without DISPLAY the surfaceless platform.

@@ -3,6 +3,7 @@
 
 #include "drivers/Driver.h"
 #include "drivers/RenderThreadSupport.h"
+#include "Owned.h"
 
 #include <nib/base.h>
 #include <nib/egl.h>
@@ -19,19 +20,6 @@
 #include <memory>
 #include <string>
 #include <vector>
-
-/// Ends objects of the renderer factory.
-struct FactoryRelease
-{
-    template <typename T>
-    void operator()(T* object) const
-    {
-        object->Release();
-    }
-};
-
-template <typename T>
-using Owned = std::unique_ptr<T, FactoryRelease>;
 
 /// An offscreen render thread that manages its objects, beside the surface render thread that it
 /// shares with. Resources are made, used and ended inside OnThread.

@@ -3,6 +3,7 @@
 
 #include "drivers/DriverContext.h"
 #include "gles/BoundQueue.h"
+#include "Owned.h"
 
 #include <nib/renderer_factory.h>
 
@@ -13,18 +14,6 @@
 #include <ostream>
 #include <string>
 #include <vector>
-
-/// Ends what the factory made as its owner has to.
-struct ReleaseIt
-{
-    template <typename T>
-    void operator()(T* object) const
-    {
-        object->Release();
-    }
-};
-template <typename T>
-using Owned = std::unique_ptr<T, ReleaseIt>;
 
 /// A pixel as bytes.
 struct Pixel

@@ -46,7 +46,7 @@ void DrawingLife::DrawFrame(float shade, const RectF& changed)
     OnThread(*m_surface,
              [this, shade]
              {
-                 const Made<IRenderTarget> screen(
+                 const Owned<IRenderTarget> screen(
                      RendererFactory::CreateRenderTargetFromDefault(m_width, m_height));
                  m_onScreen.DrawOffscreen(shade);
                  m_onScreen.DrawOn(*screen, shade);
@@ -86,7 +86,7 @@ void DrawingLife::DrawInFront(float shade)
     OnThread(*m_front,
              [this, shade]
              {
-                 const Made<IRenderTarget> screen(
+                 const Owned<IRenderTarget> screen(
                      RendererFactory::CreateRenderTargetFromDefault(kFrontSide, kFrontSide));
                  m_inFront.DrawOffscreen(shade);
                  m_inFront.DrawOn(*screen, shade);

@@ -32,7 +32,7 @@ void GuestLife::DrawAndExport(float shade)
 
 void GuestLife::Draw(float shade)
 {
-    const Made<IRenderTarget> screen(
+    const Owned<IRenderTarget> screen(
         RendererFactory::CreateRenderTargetFromDefault(UiThread::kSide, UiThread::kSide));
     m_things.DrawOffscreen(shade);
     m_things.DrawOn(*screen, shade);

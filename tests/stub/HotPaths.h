@@ -1,6 +1,8 @@
 #ifndef NIB_TESTS_STUB_HOTPATHS_H
 #define NIB_TESTS_STUB_HOTPATHS_H
 
+#include "../Owned.h"
+
 #include <nib/device.h>
 #include <nib/geometry.h>
 #include <nib/partial_update.h>
@@ -23,17 +25,6 @@ public:
     ~HotScene();
     HotScene(const HotScene&) = delete;
     HotScene& operator=(const HotScene&) = delete;
-
-    struct Release
-    {
-        template <typename T>
-        void operator()(T* object) const
-        {
-            object->Release();
-        }
-    };
-    template <typename T>
-    using Owned = std::unique_ptr<T, Release>;
 
     // The library's.
     Owned<Nib::ITextureObject> page;
