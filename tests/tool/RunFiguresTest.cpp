@@ -1,6 +1,8 @@
 #include "InkMlWriter.h"
 #include "RunNib.h"
 
+#include <cerrno>
+#include <cstring>
 #include <fstream>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -125,12 +127,19 @@ TEST_F(RunFigures, UnwritableJsonIsNamed)
                           "directory\n");
 }
 
-/// What the tool writes to a terminal that is its standard error.
-std::string WrittenToTerminal(const Words& arguments)
+/// Both ends of a new terminal.
+struct Terminal
 {
-    int terminal = -1, other = -1;
-    if (openpty(&terminal, &other, nullptr, nullptr, nullptr) != 0)
-        return "no terminal";
+    Terminal() { isThere = openpty(&end, &other, nullptr, nullptr, nullptr) == 0; }
+
+    bool isThere = false;
+    int end = -1;
+    int other = -1;
+};
+
+/// What the tool writes to a terminal that is its standard error.
+std::string WrittenTo(const Terminal& terminal, const Words& arguments)
+{
     const pid_t process = fork();
     if (process == 0)
     {
@@ -140,27 +149,30 @@ std::string WrittenToTerminal(const Words& arguments)
             words.push_back(const_cast<char*>(argument.c_str()));
         words.push_back(nullptr);
         unsetenv("DISPLAY");
-        dup2(other, STDERR_FILENO);
-        close(terminal);
+        dup2(terminal.other, STDERR_FILENO);
+        close(terminal.end);
         execv(NIB_TOOL, words.data());
         _exit(127);
     }
-    close(other);
+    close(terminal.other);
     std::string written;
     char buffer[4096];
-    for (ssize_t count; (count = read(terminal, buffer, sizeof buffer)) > 0;)
+    for (ssize_t count; (count = read(terminal.end, buffer, sizeof buffer)) > 0;)
         written.append(buffer, static_cast<std::size_t>(count));
-    close(terminal);
+    close(terminal.end);
     waitpid(process, nullptr, 0);
     return written;
 }
 
 TEST_F(RunFigures, BarGrowsOnATerminalFromASecondOnAndGoes)
 {
+    const Terminal terminal;
+    if (!terminal.isThere)
+        GTEST_SKIP() << "this system gives no pseudo terminal: " << std::strerror(errno);
     // Only the second of two samples comes behind the first second.
     const std::string file = m_folder.Write("in", "0 10 10 0.5\n1.2 20 20 0.5\n");
     const std::string written =
-        WrittenToTerminal({"draw", file, "-o", m_folder.Path("page.png"), "--speed", "1"});
+        WrittenTo(terminal, {"draw", file, "-o", m_folder.Path("page.png"), "--speed", "1"});
     EXPECT_EQ(written.rfind("\r[####################", 0), 0u) << written;
     EXPECT_NE(written.find("100 %"), std::string::npos) << written;
     const std::string erased = "\r\033[K";
@@ -170,8 +182,11 @@ TEST_F(RunFigures, BarGrowsOnATerminalFromASecondOnAndGoes)
 
 TEST_F(RunFigures, ShortWorkShowsNoBar)
 {
+    const Terminal terminal;
+    if (!terminal.isThere)
+        GTEST_SKIP() << "this system gives no pseudo terminal: " << std::strerror(errno);
     const std::string file = m_folder.Write("in", "0 10 10 0.5\n");
-    EXPECT_EQ(WrittenToTerminal({"draw", file, "-o", m_folder.Path("page.png")}), "");
+    EXPECT_EQ(WrittenTo(terminal, {"draw", file, "-o", m_folder.Path("page.png")}), "");
 }
 
 } // namespace
